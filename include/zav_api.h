@@ -1,0 +1,366 @@
+/*
+ * libzav: every exported function, by family.
+ *
+ * A function checks its arguments, works in the calling thread, fills records that the caller
+ * owns and returns a ZAV_RC_* code, 0 (ZAV_RC_OK) on success. It keeps nothing between calls: no
+ * descriptor, no child process, no memory. Failures go to syslog (facility LOG_DAEMON) with the
+ * name of the reporting function as ident. Unless said otherwise a function may be called from
+ * several threads at once and blocks no longer than the files and tools it reads.
+ *
+ * A device that does not exist is a successful query whose state says so, not an error.
+ *
+ * The commands are those of the appliance's shell: /bin/sh must be bash (docs/platform.md).
+ *
+ * The functions called zav... are the public interface. The others serve the library's own
+ * sources; they are exported for its test and support programs and are listed last in a family.
+ */
+#ifndef ZAV_API_H
+#define ZAV_API_H
+
+#include "zav.h"
+#include "zav_event.h"
+#include "zav_hwraid.h"
+#include "zav_led.h"
+#include "zav_rbod.h"
+
+#include <stddef.h>
+
+#if defined(__GNUC__)
+#    define ZAV_PRINTF(fmtarg, first) __attribute__((format(printf, fmtarg, first)))
+#    pragma GCC visibility push(default)
+#else
+#    define ZAV_PRINTF(fmtarg, first)
+#endif
+
+#ifdef __cplusplus
+extern "C" {
+#endif
+
+/* ==== Names of codes ==========================================================================
+ *
+ * Each writes the name of `def` into `str` and returns `str`. The buffer has no size argument:
+ * 128 bytes hold every result (the longest, all six LVM states, takes 102). A value without a
+ * name gives "Not support[<function>()]", except where told otherwise. No call blocks.
+ */
+
+/** Name of a ZAV_RAIDLVL_* code, such as "ZAV_RAIDLVL_5". */
+char *zav_raidleveldef_to_str(int def, char *str);
+
+/** Names of the ZAV_RAID_* bits, each in brackets and without separator:
+ *  "[ZAV_RAID_DEGRADED][ZAV_RAID_RESYNC]". Unknown bits are left out; none gives "". */
+char *zav_raidstatedef_to_str(int def, char *str);
+
+/** Names of the ZAV_HDD_* bits, in brackets like the RAID states. */
+char *zav_diskstatedef_to_str(int def, char *str);
+
+/** Names of the ZAV_LVM_* bits, each followed by a comma and a blank: "ZAV_LVM_NORMAL, ". */
+char *zav_lvmstatedef_to_str(int def, char *str);
+
+/** Name of one ZAV_NET_* state; network states do not combine. */
+char *zav_netstatedef_to_str(int def, char *str);
+
+/** Name of a ZAV_RBOD_* state. */
+char *zav_rbodstatedef_to_str(int def, char *str);
+
+/** Name of an expansion-unit sensor id. Another value gives the text of
+ *  zav_rbodstatedef_to_str: "Not support[zav_rbodstatedef_to_str()]". */
+char *zav_rbodid_to_str(int def, char *str);
+
+/** Name of a volume-group number: "ZAV_LVM_VG_NONE" for -1, "PrimaryOSVG" for 0, "DataVG<n>" for
+ *  every other number, negative ones included. */
+char *zav_vgdef_to_str(int def, char *str);
+
+/** Name of a device type, minor type or event type. ZAV_EVENT_SYSINFO has none. */
+char *zav_typedef_to_str(int def, char *str);
+
+/** Name of a return code. The codes of the burner from 0x2101 up and ZAV_RC_ERR_EFBIG have
+ *  none. */
+char *zav_rcdef_to_str(int def, char *str);
+
+/* ==== Diagnostics, return codes, text =========================================================*/
+
+/**
+ * Writes one line "[<errnm>] <message>" to syslog: ident `funcname`, options LOG_CONS | LOG_PID,
+ * facility LOG_DAEMON. `priority` is a syslog priority; the library uses 1 (alert) and 4
+ * (warning). Messages are cut after 511 characters. Opens and closes the log, so the caller's own
+ * openlog(3) settings are gone afterwards. Returns 0 always.
+ */
+int zavlogd(char *funcname, int priority, int errnm, const char *errmsg, ...) ZAV_PRINTF(4, 5);
+
+/**
+ * Prints a trace message to standard output if `debugtype` is at most `debuglevel`; nothing is
+ * added to it. Messages are cut after 255 characters. With type 0 the message is printed twice,
+ * then zavdbgStop(debuglevel) is called. The library's own messages have level 1 nearly
+ * everywhere and type 1 where a caller should see a failure, 2 to 4 for what is silent at that
+ * level.
+ */
+void zavdbgmsg(int debugtype, int debuglevel, const char *dbgmsg, ...) ZAV_PRINTF(3, 4);
+
+/** With a level above 1: prints "Press Enter to continue...." and reads one character from
+ *  standard input, however long that takes. Otherwise does nothing. */
+void zavdbgStop(int debuglevel);
+
+/**
+ * Converts an errno value to a ZAV_RC_* code, or back (the two are one mapping): 2, 19, 22 and 86
+ * stay what they are, every other number becomes ZAV_RC_ERR (128), 0 included. Convert only after
+ * a failure.
+ */
+int zavRCSysToZav(int systemerrno);
+int zavRCZavToSys(int zaverrno);
+
+/** Strips blanks and tabs from the start of `s`, and blanks, tabs and line feeds from its end, in
+ *  place. Carriage returns stay. A string of nothing else becomes empty. */
+void trim(char *s);
+
+/** Strips the characters that occur in `trim` from the end (rtrim) or the start (ltrim) of
+ *  `string`, in place. */
+void rtrim(char *string, char *trim);
+void ltrim(char *string, char *trim);
+
+/* ==== Device naming ===========================================================================*/
+
+/**
+ * Writes the device path (or interface name) of `dev` into `label`, a buffer of `size` bytes:
+ * {ZAV_DEV_HDD, ZAV_MINDEV_HDD_SATA, 3, 2} gives "/dev/sata/disk3p2".
+ *
+ * ZAV_RC_OK         the name, padded with NULs up to `size`
+ * ZAV_RC_ERR_EINVAL null pointer, negative disk or part, type 0: `label` is untouched;
+ *                   a pair of types without a name (physical volumes have none), an interface
+ *                   number below 1: `label` is all NUL
+ * ZAV_RC_ERR_ENOMEM size 0 (untouched), or the name and its terminator do not fit (all NUL)
+ */
+int zavDevToStr(char *label, size_t size, zavDevice *dev);
+
+/**
+ * Reads a device path (or interface name) into `dev`, the reverse of zavDevToStr. Only letters,
+ * digits and '/' are accepted, and numbers up to 2147483647 (interface numbers up to 2147483646);
+ * a number that is followed by another part of the name has at most 15 digits.
+ *
+ * ZAV_RC_OK         `dev` holds the address
+ * ZAV_RC_ERR_EINVAL null pointer (untouched), or not a name of a device: `type` is 0, the other
+ *                   fields may hold what was read before the refusal
+ */
+int zavStrToDev(const char *label, zavDevice *dev);
+
+/**
+ * Maps a software array's metadata name to its device path: a text that holds "/dev/md/MD0" to
+ * "/dev/swraid/disk1p1", and so on up to MD3 and disk4p1. `zavname` must hold 20 bytes.
+ *
+ * ZAV_RC_OK  `zavname` holds the path
+ * ZAV_RC_ERR no such name in the text, or a null pointer; `zavname` is untouched
+ */
+int trans_mdname(char *metaname, char *zavname);
+
+/* ==== Cross-process semaphores ================================================================
+ *
+ * Binary System V semaphores, one set of one semaphore per key, created with mode 0666 on first
+ * use and never removed. All return 0 on success and 128 (ZAV_RC_ERR) after a failed system call,
+ * which is logged. `key` in the calls other than semaphore_get serves the log line only.
+ */
+
+/** Opens the semaphore of `key`, creating it with value 1 (free) if need be, and stores its
+ *  identifier in `*sem_id`. 128 if `sem_id` is null. */
+int semaphore_get(int key, int *sem_id);
+
+/** Sets the value to 1. */
+int set_semvalue(int sem_id, int key);
+
+/** Removes the semaphore; those who wait for it fail. */
+int del_semvalue(int sem_id, int key);
+
+/** Takes the lock, waiting for as long as it is held. The kernel gives it back if the holder
+ *  dies. Not recursive. */
+int semaphore_p(int sem_id, int key);
+
+/** Releases the lock. Releasing one that is not held is logged and done all the same: the value
+ *  becomes 2, and the next two lockers both enter. */
+int semaphore_v(int sem_id, int key);
+
+/** Reads the value into `*pValue`: 1 free, 0 held. 128 if `pValue` is null. */
+int semaphore_getvalue(int sem_id, int key, int *pValue);
+
+/* ==== Model and configuration =================================================================*/
+
+/* Model codes: the high byte is the family, the low byte the number of data disks where the
+ * family distinguishes it. A code with a bit of 0x300 set is a known model. */
+#define ZAV_MODEL_SOLVANE_NONE 0
+#define ZAV_MODEL_SOLVANE_2740 0x100
+#define ZAV_MODEL_SOLVANE_2740_2HDD 0x102
+#define ZAV_MODEL_SOLVANE_2740_4HDD 0x104
+#define ZAV_MODEL_SOLVANE_2860 0x200 /* two disks */
+#define ZAV_MODEL_SOLVANE_2860_4HDD 0x204
+#define ZAV_MODEL_SOLVANE_2980 0x300 /* hardware RAID */
+
+/**
+ * The model the program runs on, from the BIOS product name (zavGetModelBIOS) and the number of
+ * data disks, the third field of /etc/Kiru/raidtype. ZAV_MODEL_SOLVANE_NONE (0) when the product
+ * is unknown, cannot be read (logged), or has a disk count that the model does not come with; a
+ * raidtype file that is missing or short counts as 0 disks. Opening that file is tried twice,
+ * 100 microseconds apart.
+ */
+int zavGetModel(void);
+
+/**
+ * Model code, number of disk slots and number of disks that the model's arrays are built from.
+ *
+ * 0      all three are stored
+ * 0x1301 no known model (a value outside the ZAV_RC_* table); `*model` is 0, the rest untouched
+ * 128    a model without known disk counts (rest untouched), or a null pointer (all untouched)
+ */
+int zavGetModelConfig(int *model, int *diskmax, int *diskcount);
+
+/** The RAID type of the data array, from the first field of /etc/Kiru/raidtype ("raidtype=5" gives
+ *  5); -1 if the file cannot be read or has no such field. */
+int zavGetDataRaidtype(void);
+
+/**
+ * Runs the appliance's /usr/bin/syncConf.sh and waits for its end, however long it takes. 0 when
+ * it ended with status 0; 128 when it failed or is missing (logged).
+ */
+int zavSyncConf(void);
+
+/**
+ * Routes the serial port through the GPIO lines 34, 35 and 49 under /proc/zav/sys/dev/gpio/ich9/.
+ * The lines change one after the other, in the order in which the mode needs them.
+ *
+ * 0   the lines are set
+ * 22  (ZAV_RC_ERR_EINVAL) `uartmode` is not 1 to 4; nothing was touched
+ * 2   (ZAV_RC_ERR_ENOENT) a line cannot be opened (logged); none was changed, but those that were
+ *     opened have been truncated, as their driver expects
+ * 128 (ZAV_RC_ERR) a write failed (logged)
+ */
+int zavUARTMode(int uartmode);
+
+/**
+ * The RAID controller's index of the system's time zone: the line number, from 0, of the first
+ * line of /etc/arecaTimeZone.list that contains the city of ZONE in /etc/sysconfig/clock. A zone
+ * that no line contains gives the index of the last line. -1 when there is no zone or no list.
+ */
+int zavMapArcTimeZone(void);
+
+/** Number of ATA disks in /proc/scsi/scsi, into `*diskcount` (0 if the file is missing). 128 if the
+ *  shell cannot be started or the pointer is null; `*diskcount` is then untouched. */
+int get_diskcount(int *diskcount);
+
+/* ==== BIOS settings and identity ==============================================================*/
+
+/**
+ * Copies the BIOS settings (114 bytes of /dev/nvram) into the file `filepath`, which is created or
+ * replaced. Bytes that the device does not give, because it ends early or cannot be read, are
+ * saved as zeros: check the image before trusting it. Failures are told on standard output.
+ *
+ * 0      saved
+ * 22     null path
+ * 0x1001 the file came out too short (a value outside the ZAV_RC_* table)
+ * 128    the device or the file cannot be opened, or writing failed (a full disk)
+ */
+int zavSaveBIOS(char *filepath);
+
+/**
+ * Writes a file saved by zavSaveBIOS back to /dev/nvram. Failures are told on standard output. A
+ * device that takes less than 114 bytes, or refuses them, is not reported.
+ *
+ * 0   the file was read and handed to the device
+ * 22  null path
+ * 128 the file or the device cannot be opened, or the file is shorter than 114 bytes
+ */
+int zavLoadBIOS(char *filepath);
+
+/**
+ * Reads the board's product name (/sys/class/dmi/id/product_name), or its serial number
+ * (product_serial), without the line feed, into `value`: at most `size` - 1 characters.
+ *
+ * 0   read; `value` is left as it was if the file was empty
+ * 22  null buffer or size below 1
+ * 128 the file cannot be opened (logged); `value` is untouched
+ */
+int zavGetModelBIOS(char *value, int size);
+int zavGetSerialBIOS(char *value, int size);
+
+struct smbios_header;
+
+/**
+ * The `index`-th string (from 1) of the SMBIOS structure `entry`, whose string set must follow its
+ * formatted area in memory; index 0 gives "". "Bad Index" if the set ends before it. The result
+ * points into the structure or to a constant.
+ */
+char *smbios_string(struct smbios_header *entry, int index);
+
+/**
+ * Product name (type 1) or board serial number (type 2), at most 20 characters, from the SMBIOS
+ * table in physical memory (/dev/mem): of the first structure of that type behind the table's
+ * first structure. Empty if there is none, if the table cannot be found or for any other type;
+ * null if /dev/mem cannot be opened. Failures are told on standard output. The result is one
+ * static buffer that the next call overwrites: one thread at a time.
+ */
+char *getTableEntrySMBIOS(int type);
+
+/* ==== Disk state ==============================================================================*/
+
+/**
+ * Is this disk present and healthy? `dev` is a whole disk (part 0) of minor type
+ * ZAV_MINDEV_HDD_SATA, _HWSATA or _SAS. Presence is told by the device node, health by the exit
+ * status of "smartctl -H -d ata".
+ *
+ * ZAV_RC_OK          info->state is ZAV_HDD_FOUND, _ABSENT or _FAILED; smartctl's exit status 2
+ *                    (cannot open the device) is absent, every other but 0 is failed
+ * ZAV_RC_ERR_EINVAL  null pointer, type or partition (record untouched); minor type, model without
+ *                    such disks or slot number (record filled with state 0)
+ * 0x1301             no known model; state 0
+ * ZAV_RC_ERR         the node is there but not accessible (state ZAV_HDD_ABSENT), or no shell
+ *                    could be started (state 0)
+ *
+ * Blocks about 20 seconds for an empty slot: a missing node is looked for three times, 10 seconds
+ * apart, so that a disk just inserted is found. Otherwise as long as smartctl takes.
+ */
+int zavGetStateDisk(zavDevice *dev, zavHddState *info);
+
+/** Readers by minor type. `info` comes with everything but the state filled in. */
+int getDiskStateSATA(zavDevice *dev, zavHddState *info);
+int getDiskStateHWSATA(zavDevice *dev, zavHddState *info);
+int getDiskStateSAS(zavDevice *dev, zavHddState *info);
+
+/* ==== RAID state ==============================================================================*/
+
+/**
+ * Level, state, members and rebuild progress of an array. For a software array `dev` is
+ * {ZAV_DEV_RAID, ZAV_MINDEV_RAID_SW, n, 1}: array n from 1 to 4 is md<n-1>, built from partition n
+ * of every disk of the model. The answer comes from "mdadm --detail" and /proc/mdstat. For an
+ * iSCSI target {.., ZAV_MINDEV_RAID_ISCSI, n, 0} only the device node is looked for.
+ *
+ * The state of a software array is one of ZAV_RAID_NORMAL, _DEGRADED, _FAILED, _RESYNC (a rebuild
+ * runs or waits; it replaces the others) and _NOT_EXIST. A mirror is never FAILED. `resync` is the
+ * progress in whole percent, 100 for levels without redundancy. `raidcount` and `hdddev` give the
+ * model's full layout, lost members included. An iSCSI target that exists has state 0.
+ *
+ * ZAV_RC_OK          as above; ZAV_RAID_NOT_EXIST comes with level ZAV_RAIDLVL_NONE
+ * ZAV_RC_ERR_EINVAL  null pointer, types or model (record untouched); array or partition number
+ *                    (filled, state 0; untouched for iSCSI); a RAID level the appliance does not
+ *                    build, such as RAID6, or none told (filled, level NONE)
+ * 0x1301             no known model; record untouched
+ * ZAV_RC_ERR_ENOENT  /proc/mdstat cannot be opened; level filled
+ * ZAV_RC_ERR         mdadm cannot be started; the node is there but not accessible (state
+ *                    ZAV_RAID_NOT_EXIST); or the array's third line in /proc/mdstat is none the
+ *                    appliance's kernel writes (a bitmap, a check, a pending resync): level and
+ *                    state are filled, the members are not
+ *
+ * Blocks about 20 seconds for a missing node, see zavGetStateDisk. Otherwise as long as mdadm
+ * takes.
+ */
+int zavGetStateRaid(zavDevice *dev, zavRaidState *info);
+
+/** Readers by minor type; they fill the whole record. */
+int getRaidStateSW(zavDevice *dev, zavRaidState *info);
+int getRaidStateISCSI(zavDevice *dev, zavRaidState *info);
+int getRaidStateHW(zavDevice *dev, zavRaidState *info);
+int getRaidStateSAS(zavDevice *dev, zavRaidState *info);
+
+#ifdef __cplusplus
+}
+#endif
+
+#if defined(__GNUC__)
+#    pragma GCC visibility pop
+#endif
+
+#endif
