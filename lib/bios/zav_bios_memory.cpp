@@ -1,0 +1,103 @@
+// The SMBIOS table, read from physical memory.
+#include "common/owner.h"
+#include "common/text.h"
+#include "zav_api.h"
+#include "zav_bios_smbios.h"
+#include "zav_private.h"
+
+#include <cstdio>
+#include <cstdlib>
+#include <cstring>
+#include <fcntl.h>
+#include <memory>
+#include <sys/mman.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+namespace {
+
+using zav::kParagraph;
+using zav::SmbiosTable;
+
+constexpr long kFirmwareStart = 0xF0000;
+constexpr long kFirmwareEnd = 0xFFFFE;
+
+struct Free {
+    void operator()(char *memory) const { free(memory); }
+};
+using Buffer = std::unique_ptr<char, Free>;
+
+// Finds the table's place in the firmware's memory, from the current position on.
+bool find_table(int memory, SmbiosTable &table) {
+    char paragraph[kParagraph];
+    const auto next = [&] { return read(memory, paragraph, kParagraph) == kParagraph; };
+    for (long at = kFirmwareStart; at < kFirmwareEnd && next(); at += kParagraph) {
+        if (!zav::begins_entry_point(paragraph))
+            continue;
+        at += kParagraph;
+        if (next() && zav::locates_table(paragraph, table))
+            return true;
+    }
+    return false;
+}
+
+// An image file that ends early must not be touched behind its end.
+bool ends_before(int memory, const SmbiosTable &table) {
+    struct stat status;
+    return fstat(memory, &status) == 0 && S_ISREG(status.st_mode) &&
+           status.st_size < static_cast<long long>(table.address) + table.length;
+}
+
+Buffer copy_table(int memory, const SmbiosTable &table) {
+    Buffer copy(static_cast<char *>(malloc(table.length)));
+    if (!copy) {
+        printf("malloc error");
+        return nullptr;
+    }
+    const auto page = static_cast<uint32_t>(sysconf(_SC_PAGESIZE));
+    const uint32_t offset = table.address % page;
+    const size_t size = size_t{offset} + table.length;
+    // The table may lie above 2 GiB, which a 32-bit file offset does not reach.
+    void *map = ends_before(memory, table) ? MAP_FAILED
+                                           : mmap64(nullptr, size, PROT_READ, MAP_SHARED, memory,
+                                                    static_cast<off64_t>(table.address) - offset);
+    if (map == MAP_FAILED) {
+        printf("mmap error");
+        return nullptr;
+    }
+    memcpy(copy.get(), static_cast<const char *>(map) + offset, table.length);
+    if (munmap(map, size) != 0)
+        printf("munmap error");
+    return copy;
+}
+
+} // namespace
+
+char *smbios_string(struct smbios_header *entry, int index) {
+    if (entry == nullptr)
+        return const_cast<char *>("Bad Index");
+    const char *strings = reinterpret_cast<const char *>(entry) + entry->length;
+    return const_cast<char *>(zav::smbios_string_in(strings, nullptr, index));
+}
+
+char *getTableEntrySMBIOS(int type) {
+    static char result[21];
+    const zav::Descriptor memory(open("/dev/mem", O_RDONLY | O_CLOEXEC));
+    if (!memory) {
+        printf("file open error");
+        return nullptr;
+    }
+    if (lseek(memory.get(), kFirmwareStart, SEEK_SET) < 0) {
+        printf("lseek error");
+        return result;
+    }
+    SmbiosTable table = {};
+    if (!find_table(memory.get(), table))
+        return result;
+    if (const Buffer copy = copy_table(memory.get(), table)) {
+        const char *text = zav::smbios_text(copy.get(), table.length, type);
+        if (text != nullptr)
+            zav::copy_text(result, sizeof result, text);
+    }
+    return result;
+}

@@ -1,0 +1,55 @@
+// Owners of what a call opens: nothing is left behind on any path.
+#pragma once
+
+#include <cstdio>
+#include <unistd.h>
+#include <utility>
+
+namespace zav {
+
+class File {
+  public:
+    File() = default;
+    File(const char *path, const char *mode) : file_(fopen(path, mode)) {}
+    File(const File &) = delete;
+    File &operator=(const File &) = delete;
+    ~File() { close(); }
+
+    explicit operator bool() const { return file_ != nullptr; }
+    FILE *get() const { return file_; }
+
+    void open(const char *path, const char *mode) {
+        close();
+        file_ = fopen(path, mode);
+    }
+
+    void close() {
+        if (file_ != nullptr)
+            fclose(std::exchange(file_, nullptr));
+    }
+
+    // One line of at most `size` - 1 characters, line feed included; false at the end.
+    bool line(char *buffer, int size) { return fgets(buffer, size, file_) != nullptr; }
+
+  private:
+    FILE *file_ = nullptr;
+};
+
+class Descriptor {
+  public:
+    explicit Descriptor(int fd) : fd_(fd) {}
+    Descriptor(const Descriptor &) = delete;
+    Descriptor &operator=(const Descriptor &) = delete;
+    ~Descriptor() {
+        if (fd_ >= 0)
+            ::close(fd_);
+    }
+
+    explicit operator bool() const { return fd_ >= 0; }
+    int get() const { return fd_; }
+
+  private:
+    int fd_;
+};
+
+} // namespace zav

@@ -1,0 +1,110 @@
+// Locks between processes: System V semaphores of one binary semaphore each.
+#include "common/diag.h"
+#include "zav_api.h"
+#include "zav_private.h"
+
+#include <cerrno>
+#include <cstring>
+#include <sys/ipc.h>
+#include <sys/sem.h>
+
+namespace {
+
+constexpr int kMode = 0666; // processes of any user share a lock
+constexpr int kLogNumber = 3;
+
+// `format` takes the key, the identifier, the error number and its text.
+#define LOG_FAILURE(format, key, sem_id)                                                           \
+    do {                                                                                           \
+        const int error = errno;                                                                   \
+        ZAV_LOG(zav::kAlert, kLogNumber, format, static_cast<unsigned>(key), sem_id, error,        \
+                strerror(error));                                                                  \
+    } while (false)
+
+// The kernel takes the step back if this process dies before it does so itself.
+bool change_value(int sem_id, short step) {
+    sembuf operation = {0, step, SEM_UNDO};
+    return semop(sem_id, &operation, 1) == 0;
+}
+
+} // namespace
+
+int semaphore_get(int key, int *sem_id) {
+    if (sem_id == nullptr)
+        return ZAV_RC_ERR;
+    const int created = semget(key, 1, IPC_CREAT | IPC_EXCL | kMode);
+    int found;
+    if (created < 0) {
+        ZAV_TRACE(zav::kTraceStep, "%s() - Semaphore[0x%x] Exist.\n", __func__,
+                  static_cast<unsigned>(key));
+        found = semget(key, 1, kMode);
+    } else {
+        ZAV_TRACE(zav::kTraceStep, "%s() - Semaphore[%d][0x%x] Not Exist.\n", __func__, created,
+                  static_cast<unsigned>(key));
+        found = semget(key, 1, IPC_CREAT | kMode);
+    }
+    if (found < 0) {
+        const int error = errno;
+        ZAV_LOG(zav::kAlert, kLogNumber, "semget[0x%x] failed!!. errno[%d][%s]",
+                static_cast<unsigned>(key), error, strerror(error));
+        return ZAV_RC_ERR;
+    }
+    *sem_id = found;
+    return created < 0 ? ZAV_RC_OK : set_semvalue(found, key);
+}
+
+int set_semvalue(int sem_id, int key) {
+    semun argument = {};
+    argument.val = 1;
+    if (semctl(sem_id, 0, SETVAL, argument) < 0) {
+        LOG_FAILURE("set_semvalue Failed. key[0x%x] sem_id[%d] errno[%d][%s]\n", key, sem_id);
+        return ZAV_RC_ERR;
+    }
+    return ZAV_RC_OK;
+}
+
+int del_semvalue(int sem_id, int key) {
+    if (semctl(sem_id, 0, IPC_RMID) < 0) {
+        LOG_FAILURE("del_semvalue Failed. key[0x%x] sem_id[%d] errno[%d][%s]\n", key, sem_id);
+        return ZAV_RC_ERR;
+    }
+    return ZAV_RC_OK;
+}
+
+int semaphore_p(int sem_id, int key) {
+    int value;
+    semaphore_getvalue(sem_id, key, &value);
+    if (!change_value(sem_id, -1)) {
+        LOG_FAILURE("Failed to Lock Semaphore. key[0x%x] sem_id[%d] errno[%d][%s]\n", key, sem_id);
+        return ZAV_RC_ERR;
+    }
+    return ZAV_RC_OK;
+}
+
+// A release without a lock is told, and done all the same.
+int semaphore_v(int sem_id, int key) {
+    int value;
+    if (semaphore_getvalue(sem_id, key, &value) == ZAV_RC_OK && value == 1)
+        ZAV_LOG(zav::kAlert, kLogNumber,
+                "Error! in semaphore_v(), value[%d] key[0x%x] sem_id[%d]\n", value,
+                static_cast<unsigned>(key), sem_id);
+    if (!change_value(sem_id, 1)) {
+        LOG_FAILURE("Failed to Unlock Semaphore. key[0x%x] sem_id[%d] errno[%d][%s]\n", key,
+                    sem_id);
+        return ZAV_RC_ERR;
+    }
+    return ZAV_RC_OK;
+}
+
+int semaphore_getvalue(int sem_id, int key, int *pValue) {
+    if (pValue == nullptr)
+        return ZAV_RC_ERR;
+    const int value = semctl(sem_id, 0, GETVAL);
+    if (value < 0) {
+        LOG_FAILURE("Failed to semaphore_getvalue. key[0x%x] sem_id[%d] errno[%d][%s]\n", key,
+                    sem_id);
+        return ZAV_RC_ERR;
+    }
+    *pValue = value;
+    return ZAV_RC_OK;
+}
