@@ -1,0 +1,113 @@
+#include "launcher/options.hpp"
+
+#include "model/factory.hpp"
+#include "model/sentences.hpp"
+
+#include <CLI/CLI.hpp>
+#include <fmt/format.h>
+#include <fstream>
+#include <iterator>
+#include <sstream>
+
+namespace zavsim {
+
+namespace {
+
+constexpr const char *description =
+    "Runs a program on a simulated storage appliance: a private root with the appliance's\n"
+    "files, devices and tools over one model of its disks and arrays. Nothing of it stays\n"
+    "behind. The exit status is that of COMMAND (128 + signal when a signal ended it),\n"
+    "64 for wrong usage, 71 when the machine cannot provide the private root.";
+
+constexpr const char *footer =
+    "Inside, the same program acts on the model and shows it:\n"
+    "  zavsim act SENTENCE...   e.g. zavsim act disk 3 fails\n"
+    "  zavsim state             the model as JSON\n\n"
+    "Sentences (a scenario file holds lines \"at 10s SENTENCE\"):\n"
+    "  disk N fails | vanishes | appears | joins\n"
+    "  array N checks | repairs\n"
+    "  tool NAME hangs 30s | prints \"TEXT\" | exits N | is missing | works again";
+
+class HelpPage : public CLI::Formatter {
+  public:
+    std::string make_usage(const CLI::App *, std::string) const override {
+        return "Usage: zavsim [OPTIONS] -- COMMAND [ARG...]\n";
+    }
+};
+
+[[noreturn]] void fail_usage(const std::string &message) {
+    fmt::print(stderr, "zavsim: {}\n", message);
+    std::exit(exit_usage);
+}
+
+void declare(CLI::App &app, Options &options) {
+    app.add_option("--model", options.model, "Appliance: model and number of disks")
+        ->check(CLI::IsMember(model_names()))
+        ->capture_default_str();
+    app.add_option("--level", options.level,
+                   "Level of the data array (default raid5 with four disks, raid1 with two)")
+        ->check(CLI::IsMember(level_names()));
+    app.add_option("--product", options.product, "Product name in the BIOS (default: the model's)");
+    app.add_option("--serial", options.serial, "Serial number in the BIOS");
+    app.add_option("--raidtype", options.raidtype, "Line of /etc/Kiru/raidtype");
+    app.add_option("--tools", options.tools,
+                   "Whose texts the tools print: the appliance's own, or a current Linux's")
+        ->check(CLI::IsMember({"appliance", "current"}))
+        ->capture_default_str();
+    app.add_option("--time-scale", options.time_scale, "Appliance seconds per real second")
+        ->check(CLI::Range(0.01, 100000.0))
+        ->capture_default_str();
+    app.add_option("--scenario", options.scenario_file, "File of things that happen at times");
+    app.add_option("--shell", options.shell, "What /bin/sh is (the appliance's is bash)")
+        ->check(CLI::IsMember({"bash", "dash"}))
+        ->capture_default_str();
+    app.add_flag("--bare", options.bare, "The private root alone: no model, tools or shim");
+}
+
+std::string read_scenario(const std::string &file) {
+    std::ifstream in(file);
+    if (!in)
+        fail_usage(fmt::format("{}: cannot be read", file));
+    std::string text{std::istreambuf_iterator<char>(in), {}};
+    const Scenario scenario = parse_scenario(text, file);
+    for (const std::string &error : scenario.errors)
+        fmt::print(stderr, "{}\n", error);
+    if (!scenario.errors.empty())
+        std::exit(exit_usage);
+    return text;
+}
+
+// A level that the number of disks cannot carry is a mistake, not an appliance.
+void check_level(const Options &options) {
+    const std::string reason = level_problem(options.model, options.level);
+    if (!reason.empty())
+        fail_usage(reason);
+}
+
+} // namespace
+
+Options parse_command_line(int argc, char **argv) {
+    Options options;
+    const auto words = std::vector<std::string>(argv + 1, argv + argc);
+    const auto dashes = std::find(words.begin(), words.end(), "--");
+    CLI::App app{description, "zavsim"};
+    app.formatter(std::make_shared<HelpPage>());
+    app.footer(footer);
+    declare(app, options);
+    // CLI11 takes its words last first.
+    std::vector<std::string> own(std::make_reverse_iterator(dashes), words.rend());
+    try {
+        app.parse(own);
+    } catch (const CLI::ParseError &error) {
+        std::exit(app.exit(error) == 0 ? 0 : exit_usage);
+    }
+    if (dashes == words.end() || dashes + 1 == words.end())
+        fail_usage("no command given: zavsim [OPTIONS] -- COMMAND [ARG...]");
+    options.command.assign(dashes + 1, words.end());
+    check_level(options);
+    if (!options.scenario_file.empty())
+        options.scenario = read_scenario(options.scenario_file);
+    return options;
+}
+
+} // namespace zavsim

@@ -1,0 +1,185 @@
+#include "model/actions.hpp"
+
+#include "model/arrays.hpp"
+#include "model/disks.hpp"
+#include "model/sentences.hpp"
+
+#include <algorithm>
+#include <cstdio>
+#include <fmt/format.h>
+
+namespace zavsim {
+
+namespace {
+
+// The member that an array holds of this very disk, whatever it is called by now.
+const Member *held_member(const Array &array, const Disk &disk) {
+    for (const Member &member : array.members)
+        if (member.serial == disk.serial)
+            return &member;
+    return nullptr;
+}
+
+void fail_members(State &state, const Disk &disk) {
+    for (Array &array : state.arrays)
+        if (const Member *member = held_member(array, disk))
+            fail_member(state, array, std::string(member->letter), member->partition);
+}
+
+std::string disk_fails(State &state, Disk &disk) {
+    if (!disk.inserted)
+        return fmt::format("there is no disk {}", disk.slot);
+    disk.failing = true;
+    fail_members(state, disk);
+    return {};
+}
+
+std::string disk_vanishes(State &state, Disk &disk) {
+    if (!disk.inserted)
+        return fmt::format("there is no disk {}", disk.slot);
+    detach(state, disk);
+    disk.inserted = false;
+    fail_members(state, disk);
+    return {};
+}
+
+std::string disk_appears(State &state, Disk &disk) {
+    if (disk.inserted)
+        return fmt::format("disk {} is in its slot", disk.slot);
+    disk = blank_disk(state, disk.slot);
+    attach(state, disk);
+    return {};
+}
+
+const Disk *pattern_for(const State &state, const Disk &disk) {
+    for (const Disk &other : state.disks)
+        if (other.slot != disk.slot && other.attached && !other.partitions.empty())
+            return &other;
+    return nullptr;
+}
+
+void copy_partitions(const Disk &pattern, Disk &disk) {
+    for (const Partition &partition : pattern.partitions)
+        disk.partitions.push_back({partition.number, partition.kib, std::nullopt});
+}
+
+void drop_faulty_members_of_slot(Array &array, int slot) {
+    auto &members = array.members;
+    members.erase(std::remove_if(members.begin(), members.end(),
+                                 [slot](const Member &member) {
+                                     return member.slot == slot && member.role == Role::faulty;
+                                 }),
+                  members.end());
+}
+
+std::string disk_joins(State &state, Disk &disk) {
+    if (!disk.attached)
+        return fmt::format("there is no disk {}", disk.slot);
+    const Disk *pattern = pattern_for(state, disk);
+    if (disk.partitions.empty() && pattern == nullptr)
+        return fmt::format("no other disk has partitions for disk {}", disk.slot);
+    if (disk.partitions.empty())
+        copy_partitions(*pattern, disk);
+    // From the first array on: the one that asks first rebuilds first.
+    for (auto array = state.arrays.rbegin(); array != state.arrays.rend(); ++array) {
+        drop_faulty_members_of_slot(*array, disk.slot);
+        if (is_degraded(*array))
+            add_member(state, *array, disk.letter, array->minor + 1);
+    }
+    return {};
+}
+
+std::string act_on_disk(State &state, const Action &action) {
+    Disk *disk = find_disk(state, action.number);
+    if (disk == nullptr)
+        return fmt::format("this model has no slot {}", action.number);
+    switch (action.kind) {
+    case Action::Kind::disk_fails:
+        return disk_fails(state, *disk);
+    case Action::Kind::disk_vanishes:
+        return disk_vanishes(state, *disk);
+    case Action::Kind::disk_appears:
+        return disk_appears(state, *disk);
+    default:
+        return disk_joins(state, *disk);
+    }
+}
+
+std::string act_on_array(State &state, const Action &action) {
+    Array *array = find_array(state, action.number - 1);
+    if (array == nullptr)
+        return fmt::format("there is no array {}", action.number);
+    const SyncKind kind =
+        action.kind == Action::Kind::array_checks ? SyncKind::check : SyncKind::repair;
+    if (start_scrub(state, *array, kind) != Refusal::none)
+        return fmt::format("array {} is busy or has no redundancy", action.number);
+    return {};
+}
+
+ToolFault &fault_of(State &state, const std::string &tool) {
+    for (ToolFault &fault : state.faults)
+        if (fault.tool == tool)
+            return fault;
+    state.faults.push_back({tool, 0, std::nullopt, std::nullopt, false});
+    return state.faults.back();
+}
+
+void act_on_tool(State &state, const Action &action) {
+    ToolFault &fault = fault_of(state, action.tool);
+    if (action.kind == Action::Kind::tool_hangs)
+        fault.hangs = action.seconds;
+    else if (action.kind == Action::Kind::tool_prints)
+        fault.prints = action.text;
+    else if (action.kind == Action::Kind::tool_exits)
+        fault.exits = action.status;
+    else if (action.kind == Action::Kind::tool_is_missing)
+        fault.missing = true;
+    else
+        fault = ToolFault{action.tool, 0, std::nullopt, std::nullopt, false};
+}
+
+bool is_about_disk(Action::Kind kind) {
+    return kind <= Action::Kind::disk_joins;
+}
+bool is_about_array(Action::Kind kind) {
+    return kind == Action::Kind::array_checks || kind == Action::Kind::array_repairs;
+}
+
+} // namespace
+
+std::string perform(State &state, const Action &action) {
+    if (is_about_disk(action.kind))
+        return act_on_disk(state, action);
+    if (is_about_array(action.kind))
+        return act_on_array(state, action);
+    act_on_tool(state, action);
+    return {};
+}
+
+std::string perform_sentence(State &state, const std::string &sentence) {
+    const Sentence parsed = parse_sentence(sentence);
+    const std::string problem = parsed.error.empty() ? perform(state, parsed.action) : parsed.error;
+    state.notes.push_back(problem.empty() ? sentence : sentence + ": " + problem);
+    return problem;
+}
+
+void scsi_command(State &state, const std::string &line) {
+    char verb[32] = {};
+    int host = -1;
+    int zero[3] = {};
+    if (sscanf(line.c_str(), "scsi %31s %d %d %d %d", verb, &host, &zero[0], &zero[1], &zero[2]) !=
+        5)
+        return;
+    for (Disk &disk : state.disks) {
+        if (disk.host != host || !disk.inserted)
+            continue;
+        if (std::string(verb) == "add-single-device" && !disk.attached) {
+            attach(state, disk);
+        } else if (std::string(verb) == "remove-single-device" && disk.attached) {
+            detach(state, disk);
+            fail_members(state, disk);
+        }
+    }
+}
+
+} // namespace zavsim

@@ -1,0 +1,56 @@
+#include "model/json.hpp"
+
+#include <nlohmann/json.hpp>
+
+namespace nlohmann {
+
+template <typename Value>
+struct adl_serializer<std::optional<Value>> {
+    static void to_json(json &out, const std::optional<Value> &value) {
+        out = value ? json(*value) : json(nullptr);
+    }
+    static void from_json(const json &in, std::optional<Value> &value) {
+        value = in.is_null() ? std::nullopt : std::optional<Value>(in.get<Value>());
+    }
+};
+
+} // namespace nlohmann
+
+namespace zavsim {
+
+NLOHMANN_JSON_SERIALIZE_ENUM(Role, {{Role::in_sync, "in sync"},
+                                    {Role::rebuilding, "rebuilding"},
+                                    {Role::spare, "spare"},
+                                    {Role::faulty, "faulty"}})
+NLOHMANN_JSON_SERIALIZE_ENUM(SyncKind, {{SyncKind::none, "none"},
+                                        {SyncKind::recovery, "recovery"},
+                                        {SyncKind::resync, "resync"},
+                                        {SyncKind::repair, "repair"},
+                                        {SyncKind::check, "check"}})
+NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(Superblock, uuid, number)
+NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(Partition, number, kib, superblock)
+NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(Disk, slot, host, letter, serial, inserted, attached, failing,
+                                   kib, partitions)
+NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(Member, slot, serial, letter, partition, number, raid_device,
+                                   role)
+NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(Sync, kind, order, started, running, pending, done_kib)
+NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(Array, minor, name, level, metadata, raid_devices, chunk_kib,
+                                   component_kib, uuid, created, updated, events, bitmap, inactive,
+                                   auto_read_only, sync, members)
+NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(ToolFault, tool, hangs, prints, exits, missing)
+NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(Event, at, sentence)
+NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(State, model, current_tools, time_scale, real_start, now,
+                                   rebuild_kib_per_second, next_serial, next_sync_order, disks,
+                                   arrays, faults, scenario, scsi_hosts, notes)
+
+std::string to_text(const State &state) {
+    // A garbled tool text may hold any bytes.
+    return nlohmann::json(state).dump(2, ' ', false, nlohmann::json::error_handler_t::replace) +
+           "\n";
+}
+
+State state_from_text(const std::string &text) {
+    return nlohmann::json::parse(text).get<State>();
+}
+
+} // namespace zavsim

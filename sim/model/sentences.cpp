@@ -1,0 +1,237 @@
+#include "model/sentences.hpp"
+
+#include <algorithm>
+#include <array>
+#include <fmt/format.h>
+#include <optional>
+#include <sstream>
+
+namespace zavsim {
+
+namespace {
+
+struct Word {
+    std::string text;
+    bool quoted = false;
+};
+
+struct Words {
+    std::vector<Word> list;
+    std::string error;
+};
+
+char unescaped(char c) {
+    return c == 'n' ? '\n' : c == 't' ? '\t' : c;
+}
+
+// Reads a quoted word from behind its opening quote; answers where it ended, or nothing.
+std::optional<std::size_t> read_quoted(const std::string &text, std::size_t at, Word &word) {
+    word.quoted = true;
+    for (; at < text.size() && text[at] != '"'; ++at)
+        if (text[at] == '\\' && at + 1 < text.size())
+            word.text += unescaped(text[++at]);
+        else
+            word.text += text[at];
+    if (at == text.size())
+        return std::nullopt;
+    return at + 1;
+}
+
+// Splits at blanks; "..." is one word; # starts a comment.
+Words split(const std::string &text) {
+    Words words;
+    for (std::size_t at = 0; at < text.size();) {
+        if (isspace(static_cast<unsigned char>(text[at])) != 0) {
+            ++at;
+            continue;
+        }
+        if (text[at] == '#')
+            break;
+        Word word;
+        if (text[at] == '"') {
+            const auto end = read_quoted(text, at + 1, word);
+            if (!end)
+                return {{}, "a quoted text has no end"};
+            at = *end;
+        } else {
+            const std::size_t end = std::min(text.find_first_of(" \t\r", at), text.size());
+            word.text = text.substr(at, end - at);
+            at = end;
+        }
+        words.list.push_back(word);
+    }
+    return words;
+}
+
+std::optional<int> whole_number(const std::string &text, int least, int most) {
+    if (text.empty() || text.size() > 4 ||
+        text.find_first_not_of("0123456789") != std::string::npos)
+        return std::nullopt;
+    const int number = std::stoi(text);
+    return number < least || number > most ? std::nullopt : std::optional(number);
+}
+
+// 10s, 2m, 500ms, 1.5s
+std::optional<double> duration(const std::string &text) {
+    const std::size_t end = std::min(text.find_first_not_of("0123456789."), text.size());
+    const std::string digits = text.substr(0, end);
+    const std::string unit = text.substr(end);
+    const double factor = unit == "s" ? 1 : unit == "m" ? 60 : unit == "ms" ? 0.001 : 0;
+    if (factor == 0 || digits.empty() || digits.size() > 9 || digits.front() == '.' ||
+        std::count(digits.begin(), digits.end(), '.') > 1)
+        return std::nullopt;
+    return std::stod(digits) * factor;
+}
+
+Sentence wrong(const std::string &error) {
+    return {{}, error};
+}
+
+struct Verb {
+    const char *word;
+    Action::Kind kind;
+};
+
+template <std::size_t Count>
+Sentence about_numbered(const std::vector<Word> &words, const std::array<Verb, Count> &verbs,
+                        const std::string &allowed) {
+    const std::string &noun = words[0].text;
+    const auto number = words.size() < 2 ? std::nullopt : whole_number(words[1].text, 1, 4);
+    if (!number)
+        return wrong(fmt::format("{} wants a number from 1 to 4", noun));
+    for (const Verb &verb : verbs)
+        if (words.size() == 3 && words[2].text == verb.word) {
+            Action action;
+            action.kind = verb.kind;
+            action.number = *number;
+            return {action, {}};
+        }
+    return wrong(fmt::format("{} {} {}", noun, *number, allowed));
+}
+
+Sentence about_disk(const std::vector<Word> &words) {
+    static constexpr std::array<Verb, 4> verbs = {{{"fails", Action::Kind::disk_fails},
+                                                   {"vanishes", Action::Kind::disk_vanishes},
+                                                   {"appears", Action::Kind::disk_appears},
+                                                   {"joins", Action::Kind::disk_joins}}};
+    return about_numbered(words, verbs, "fails, vanishes, appears or joins");
+}
+
+Sentence about_array(const std::vector<Word> &words) {
+    static constexpr std::array<Verb, 2> verbs = {
+        {{"checks", Action::Kind::array_checks}, {"repairs", Action::Kind::array_repairs}}};
+    return about_numbered(words, verbs, "checks or repairs");
+}
+
+bool known(const std::string &tool) {
+    const auto &tools = known_tools();
+    return std::find(tools.begin(), tools.end(), tool) != tools.end();
+}
+
+Sentence tool_state(Action action, const Word &verb_word, const Word &object_word) {
+    const std::string &verb = verb_word.text;
+    const std::string &object = object_word.text;
+    if (verb == "is" && object == "missing") {
+        action.kind = Action::Kind::tool_is_missing;
+    } else if (verb == "works" && object == "again") {
+        action.kind = Action::Kind::tool_works;
+    } else if (verb == "hangs" && duration(object)) {
+        action.kind = Action::Kind::tool_hangs;
+        action.seconds = *duration(object);
+    } else if (verb == "prints" && object_word.quoted) {
+        action.kind = Action::Kind::tool_prints;
+        action.text = object;
+    } else if (verb == "exits" && whole_number(object, 0, 255)) {
+        action.kind = Action::Kind::tool_exits;
+        action.status = *whole_number(object, 0, 255);
+    } else {
+        return wrong(fmt::format(
+            "tool {} hangs 30s, prints \"text\", exits N (0 to 255), is missing or works again",
+            action.tool));
+    }
+    return {action, {}};
+}
+
+Sentence about_tool(const std::vector<Word> &words) {
+    if (words.size() < 2 || !known(words[1].text))
+        return wrong(fmt::format("tool wants one of: {}", fmt::join(known_tools(), ", ")));
+    Action action;
+    action.tool = words[1].text;
+    return words.size() == 4 ? tool_state(action, words[2], words[3]) : tool_state(action, {}, {});
+}
+
+Sentence from_words(const std::vector<Word> &words) {
+    const std::string noun = words.empty() ? "" : words.front().text;
+    if (noun == "disk")
+        return about_disk(words);
+    if (noun == "array")
+        return about_array(words);
+    if (noun == "tool")
+        return about_tool(words);
+    return wrong("a sentence begins with disk, array or tool");
+}
+
+// One line of a scenario: nothing, or "at TIME SENTENCE".
+std::string read_line(const std::string &line, std::vector<Event> &events) {
+    const Words words = split(line);
+    if (!words.error.empty() || words.list.empty())
+        return words.error;
+    const auto at = words.list.size() < 2 ? std::nullopt : duration(words.list[1].text);
+    if (words.list[0].text != "at" || !at)
+        return "a line reads: at 10s SENTENCE (times in s, m or ms)";
+    const Sentence sentence = from_words({words.list.begin() + 2, words.list.end()});
+    if (!sentence.error.empty())
+        return sentence.error;
+    std::vector<std::string> texts;
+    for (auto word = words.list.begin() + 2; word != words.list.end(); ++word)
+        texts.push_back(word->text);
+    events.push_back({*at, join_words(texts)});
+    return {};
+}
+
+std::string quoted(const std::string &word) {
+    std::string text = "\"";
+    for (char c : word)
+        text += c == '\n'               ? std::string("\\n")
+                : c == '\t'             ? std::string("\\t")
+                : c == '"' || c == '\\' ? std::string("\\") + c
+                                        : std::string(1, c);
+    return text + '"';
+}
+
+} // namespace
+
+const std::vector<std::string> &known_tools() {
+    static const std::vector<std::string> tools = {"mdadm", "smartctl", "mknod"};
+    return tools;
+}
+
+std::string join_words(const std::vector<std::string> &words) {
+    std::string sentence;
+    for (std::size_t i = 0; i < words.size(); ++i) {
+        const bool is_text = i > 0 && words[i - 1] == "prints";
+        sentence += (i == 0 ? "" : " ") + (is_text ? quoted(words[i]) : words[i]);
+    }
+    return sentence;
+}
+
+Sentence parse_sentence(const std::string &text) {
+    const Words words = split(text);
+    return words.error.empty() ? from_words(words.list) : wrong(words.error);
+}
+
+Scenario parse_scenario(const std::string &text, const std::string &file) {
+    Scenario scenario;
+    std::istringstream in(text);
+    std::string line;
+    for (int number = 1; std::getline(in, line); ++number) {
+        const std::string error = read_line(line, scenario.events);
+        if (!error.empty())
+            scenario.errors.push_back(fmt::format("{}:{}: {}", file, number, error));
+    }
+    std::stable_sort(scenario.events.begin(), scenario.events.end(),
+                     [](const Event &a, const Event &b) { return a.at < b.at; });
+    return scenario;
+}
+
+} // namespace zavsim

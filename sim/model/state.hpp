@@ -1,0 +1,132 @@
+// The one model of the appliance's state. Plain values only: whatever acts on it is a function of
+// (state, time), whatever shows it a function from state to text.
+#pragma once
+
+#include <cstdint>
+#include <optional>
+#include <string>
+#include <vector>
+
+namespace zavsim {
+
+// What an array leaves on its members: by it a partition tells where it belonged.
+struct Superblock {
+    std::string uuid;
+    int number = 0;
+};
+
+struct Partition {
+    int number = 0;
+    std::uint64_t kib = 0;
+    std::optional<Superblock> superblock;
+};
+
+struct Disk {
+    int slot = 0;          // 1 to 4, as on the front
+    int host = 0;          // SCSI host of the slot's port
+    std::string letter;    // kernel name without "sd"
+    int serial = 0;        // tells a replacement from its predecessor
+    bool inserted = false; // stands in the slot
+    bool attached = false; // known to the kernel
+    bool failing = false;  // health check fails
+    std::uint64_t kib = 0;
+    std::vector<Partition> partitions;
+};
+
+enum class Role { in_sync, rebuilding, spare, faulty };
+
+// An array's hold on a partition; outlives the disk's node.
+struct Member {
+    int slot = 0;
+    int serial = 0;
+    std::string letter;
+    int partition = 0;
+    int number = 0;       // descriptor number, the [n] of mdstat
+    int raid_device = -1; // place in the layout; -1 for none
+    Role role = Role::in_sync;
+};
+
+enum class SyncKind { none, recovery, resync, repair, check };
+
+struct Sync {
+    SyncKind kind = SyncKind::none;
+    int order = 0;      // who asked first runs first
+    double started = 0; // appliance time at which it began to run; meaningful once running
+    bool running = false;
+    bool pending = false; // waits for the first write, the array being auto-read-only
+    double done_kib = 0;
+};
+
+struct Array {
+    int minor = 0;
+    std::string name;  // in the superblock: MD0
+    std::string level; // raid1, ...
+    std::string metadata = "1.2";
+    int raid_devices = 0;
+    int chunk_kib = 0;
+    std::uint64_t component_kib = 0;
+    std::string uuid;
+    double created = 0; // appliance time; negative: before this start
+    double updated = 0;
+    int events = 0;
+    bool bitmap = false;
+    bool inactive = false;
+    bool auto_read_only = false;
+    Sync sync;
+    std::vector<Member> members; // in the kernel's order, newest first
+};
+
+struct ToolFault {
+    std::string tool;
+    double hangs = 0; // appliance seconds, each run
+    std::optional<std::string> prints;
+    std::optional<int> exits;
+    bool missing = false;
+};
+
+// One sentence of the scenario language, taken apart.
+struct Action {
+    enum class Kind {
+        disk_fails,
+        disk_vanishes,
+        disk_appears,
+        disk_joins,
+        array_checks,
+        array_repairs,
+        tool_hangs,
+        tool_prints,
+        tool_exits,
+        tool_is_missing,
+        tool_works
+    };
+    Kind kind = Kind::disk_fails;
+    int number = 0; // disk or array, counted from 1
+    std::string tool;
+    double seconds = 0;
+    std::string text;
+    int status = 0;
+};
+
+struct Event {
+    double at = 0;
+    std::string sentence;
+};
+
+struct State {
+    std::string model;
+    bool current_tools = false;
+    double time_scale = 1;
+    double real_start = 0; // monotonic clock of the machine when the appliance started
+    double now = 0;        // appliance time, seconds since start; the state holds for this moment
+    double rebuild_kib_per_second = 0;
+    int next_serial = 1;
+    int next_sync_order = 1;
+    std::vector<Disk> disks;   // in the order in which the kernel found them
+    std::vector<Array> arrays; // newest first
+    std::vector<ToolFault> faults;
+    std::vector<Event> scenario; // what is still to come, soonest first
+    std::vector<int> scsi_hosts; // hosts with a device, in the order in which the kernel found them
+    std::vector<std::string> notes; // what happened, not yet written to the log
+};
+
+} // namespace zavsim

@@ -1,0 +1,39 @@
+#include "model/arrays.hpp"
+#include "model/texts.hpp"
+
+#include <fmt/format.h>
+
+namespace zavsim {
+
+std::string examine_scan_text(const State &state, const Partition &partition) {
+    const Array *array =
+        partition.superblock ? array_of_uuid(state, partition.superblock->uuid) : nullptr;
+    if (array == nullptr)
+        return {};
+    if (state.current_tools)
+        return fmt::format("ARRAY /dev/md/{}  metadata={} UUID={} name=appliance:{}\n", array->name,
+                           array->metadata, array->uuid, array->name);
+    return fmt::format("ARRAY /dev/md/{} level={} metadata={} num-devices={} UUID={} "
+                       "name=appliance:{}\n",
+                       array->name, array->level, array->metadata, array->raid_devices, array->uuid,
+                       array->name);
+}
+
+std::string query_text(const State &state, const Disk &disk, const Partition *partition,
+                       const std::string &shown_name) {
+    std::string text = shown_name + ": is not an md array\n";
+    if (partition == nullptr || !partition->superblock)
+        return text;
+    const Array *array = array_of_uuid(state, partition->superblock->uuid);
+    if (array == nullptr)
+        return text;
+    // A partition that the array no longer holds is a mismatch, however good its data.
+    const Member *member = find_member(*array, disk.letter, partition->number);
+    const bool held = member != nullptr && member->serial == disk.serial;
+    return text + fmt::format("{}: device {} in {} device {} {} /dev/md{}.  Use mdadm --examine "
+                              "for more detail.\n",
+                              shown_name, partition->superblock->number, array->raid_devices,
+                              held ? "active" : "mismatch", array->level, array->minor);
+}
+
+} // namespace zavsim

@@ -1,0 +1,36 @@
+// Small file helpers of the private root.
+#pragma once
+
+#include <cstdint>
+#include <filesystem>
+#include <optional>
+#include <string>
+
+namespace zavsim {
+
+std::optional<std::string> read_text(const std::filesystem::path &path);
+
+// Replaces the file whole, so that a reader sees the old text or the new one; leaves an unchanged
+// file alone.
+void write_text(const std::filesystem::path &path, const std::string &text);
+
+// Makes or corrects a symbolic link.
+void point_link(const std::filesystem::path &link, const std::string &target);
+
+// A file of that size that occupies nothing.
+void make_sparse(const std::filesystem::path &path, std::uint64_t bytes);
+
+// An open file that is closed with its owner.
+class Descriptor {
+  public:
+    explicit Descriptor(int fd) : fd_(fd) {}
+    ~Descriptor();
+    Descriptor(const Descriptor &) = delete;
+    Descriptor &operator=(const Descriptor &) = delete;
+    int get() const { return fd_; }
+
+  private:
+    int fd_;
+};
+
+} // namespace zavsim

@@ -1,0 +1,125 @@
+#include "root/publish.hpp"
+
+#include "launcher/sandbox.hpp"
+#include "model/devices.hpp"
+#include "model/texts.hpp"
+#include "root/files.hpp"
+#include "tools/tools.hpp"
+
+#include <filesystem>
+#include <map>
+#include <nlohmann/json.hpp>
+#include <set>
+
+namespace fs = std::filesystem;
+
+namespace zavsim {
+
+namespace {
+
+// A detached disk keeps its content in its bay until it is attached again.
+const fs::path bays = "/dev/.bays";
+
+void remove_stale_links(const std::set<std::string> &wanted) {
+    for (const std::string directory : {"/dev/sata", "/dev/swraid", "/dev/md"})
+        for (const auto &entry : fs::directory_iterator(directory))
+            if (belongs_to_model(directory, entry.path().filename()) &&
+                wanted.count(entry.path()) == 0)
+                fs::remove(entry.path());
+}
+
+fs::path bay_of(const std::string &name, int serial) {
+    // Named by disk and partition, for the kernel name may be another one the next time.
+    const std::size_t digits = name.find_first_of("0123456789");
+    return bays / (std::to_string(serial) +
+                   (digits == std::string::npos ? "" : "p" + name.substr(digits)));
+}
+
+using Owners = std::map<std::string, int>;
+const fs::path owners_file = place::run + "/owners";
+
+Owners read_owners() {
+    const auto text = read_text(owners_file);
+    return text ? nlohmann::json::parse(*text).get<Owners>() : Owners{};
+}
+
+// Nodes that are gone, or whose name another disk has now, go to their bays.
+void remove_stale_nodes(const Owners &wanted, const Owners &present) {
+    for (const auto &[name, serial] : present) {
+        const auto found = wanted.find(name);
+        if (found != wanted.end() && found->second == serial)
+            continue;
+        const fs::path node = fs::path("/dev") / name;
+        std::error_code error;
+        if (serial == 0)
+            fs::remove(node, error);
+        else
+            fs::rename(node, bay_of(name, serial), error);
+    }
+}
+
+void make_node(const Node &node) {
+    const std::string name = fs::path(node.path).filename();
+    std::error_code error;
+    if (node.serial != 0 && !fs::exists(node.path))
+        fs::rename(bay_of(name, node.serial), node.path, error);
+    if (!fs::exists(node.path))
+        make_sparse(node.path, node.bytes);
+}
+
+void publish_devices(const State &state) {
+    const std::vector<Node> nodes = device_nodes(state);
+    std::set<std::string> links;
+    Owners owners;
+    for (const Node &node : nodes)
+        if (node.target.empty())
+            owners[fs::path(node.path).filename()] = node.serial;
+        else
+            links.insert(node.path);
+    fs::create_directories(bays);
+    remove_stale_links(links);
+    const Owners present = read_owners();
+    if (present != owners) {
+        remove_stale_nodes(owners, present);
+        write_text(owners_file, nlohmann::json(owners).dump());
+    }
+    for (const Node &node : nodes)
+        if (node.target.empty())
+            make_node(node);
+        else
+            point_link(node.path, node.target);
+}
+
+// The controller has six ports, with a disk or without.
+void publish_ports() {
+    for (int host = 0; host < 6; ++host)
+        fs::create_directories("/sys/devices/pci0000:00/0000:00:1f.2/host" + std::to_string(host));
+}
+
+bool is_missing(const State &state, const std::string &tool) {
+    for (const ToolFault &fault : state.faults)
+        if (fault.tool == tool)
+            return fault.missing;
+    return false;
+}
+
+void publish_tools(const State &state) {
+    for (const Tool &tool : simulated_tools()) {
+        if (is_missing(state, tool.name))
+            fs::remove(tool.path);
+        else
+            point_link(tool.path, place::program);
+    }
+}
+
+} // namespace
+
+void publish(const State &state) {
+    write_text("/proc/mdstat", mdstat_text(state));
+    write_text("/proc/scsi/scsi", scsi_text(state));
+    publish_devices(state);
+    publish_ports();
+    publish_tools(state);
+}
+
+} // namespace zavsim

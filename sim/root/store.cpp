@@ -1,0 +1,64 @@
+#include "root/store.hpp"
+
+#include "launcher/sandbox.hpp"
+#include "model/advance.hpp"
+#include "model/factory.hpp"
+#include "model/json.hpp"
+#include "model/sentences.hpp"
+#include "root/publish.hpp"
+
+#include <cerrno>
+#include <ctime>
+#include <fcntl.h>
+#include <stdexcept>
+#include <sys/file.h>
+#include <system_error>
+
+namespace zavsim {
+
+namespace {
+
+const std::string state_file = place::run + "/state.json";
+const std::string lock_file = place::run + "/lock";
+
+double machine_seconds() {
+    timespec now{};
+    clock_gettime(CLOCK_MONOTONIC, &now);
+    return static_cast<double>(now.tv_sec) + static_cast<double>(now.tv_nsec) * 1e-9;
+}
+
+int open_locked() {
+    const int fd = open(lock_file.c_str(), O_RDWR | O_CREAT | O_CLOEXEC, 0660);
+    while (fd >= 0 && flock(fd, LOCK_EX) != 0 && errno == EINTR) {
+    }
+    return fd;
+}
+
+State load() {
+    const auto text = read_text(state_file);
+    if (!text)
+        throw std::runtime_error("no simulated appliance here (" + state_file + " is missing)");
+    return state_from_text(*text);
+}
+
+} // namespace
+
+Turn::Turn() : lock_(open_locked()), state_(load()) {
+    advance(state_, (machine_seconds() - state_.real_start) * state_.time_scale);
+}
+
+void Turn::commit() {
+    write_text(state_file, to_text(state_));
+    publish(state_);
+}
+
+void start_model(const Options &options) {
+    State state = new_appliance(
+        {options.model, options.level, options.tools == "current", options.time_scale});
+    state.real_start = machine_seconds();
+    state.scenario = parse_scenario(options.scenario, options.scenario_file).events;
+    write_text(state_file, to_text(state));
+    publish(state);
+}
+
+} // namespace zavsim
