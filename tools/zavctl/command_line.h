@@ -1,0 +1,24 @@
+// The command line: from words to an action, or to help, or to a hint at what was meant.
+#pragma once
+
+#include "objects/session.h"
+
+#include <memory>
+#include <string>
+#include <vector>
+
+namespace zavctl {
+
+std::unique_ptr<CLI::App> make_command_line(Session &session);
+
+struct Parsed {
+    bool run = false;    // session.action is to be run
+    int status = 0;      // otherwise: the exit status
+    std::string out;     // for standard output: help that was asked for
+    std::string message; // for standard error: what is wrong
+};
+
+// Sets session.action or says why not.
+Parsed parse(CLI::App &root, Session &session, std::vector<std::string> words);
+
+} // namespace zavctl

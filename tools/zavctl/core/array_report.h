@@ -1,0 +1,48 @@
+// What the library says about one array, judged and shown.
+#pragma once
+
+#include "answer.h"
+#include "disk_report.h"
+
+#include <optional>
+#include <string>
+#include <vector>
+
+namespace zavctl {
+
+struct ArrayReport {
+    int number = 0;
+    Address address;
+    std::string kernel_name; // "md1", "" for an array of the RAID controller
+    int state = 0;           // ZAV_RAID_* bits
+    int level = 0;           // ZAV_RAIDLVL_*, 0 if not told
+    double resync = 0;       // as the library gives it
+    bool expected = false;   // some disk has a partition for it, or its node exists
+    std::vector<Address> members;
+    std::string doubt;       // why the answer cannot be trusted, "" if it can
+    std::string kernel_says; // the array's lines in /proc/mdstat, "" if there are none
+    std::string refusal;     // what in those lines the library does not take, "" if nothing
+    std::optional<Failure> failure;
+};
+
+// "normal", "degraded", "resync", "failed", "not_exist", "present", "unknown".
+std::string array_state_word(const ArrayReport &array);
+
+// "raid5", "linear", "none", "unknown".
+std::string level_word(int level);
+
+Severity severity(const ArrayReport &array);
+std::string shown_state(const ArrayReport &array);
+std::string array_note(const ArrayReport &array);
+
+// The progress of a rebuild in percent; none unless one runs or waits.
+std::optional<double> rebuild_percent(const ArrayReport &array);
+
+Json array_json(const ArrayReport &array);
+
+// `disks` are those asked in the same run, if any: a member on a disk that is not found is marked.
+Section array_list_section(const std::vector<ArrayReport> &arrays,
+                           const std::vector<DiskReport> &disks);
+Section array_show_section(const std::vector<ArrayReport> &arrays);
+
+} // namespace zavctl

@@ -1,0 +1,28 @@
+// How bad an answer is, and the exit status that says so.
+#pragma once
+
+#include <string>
+
+namespace zavctl {
+
+// In order of badness. "Could not tell" is worse than a warning, since anything may hide behind
+// it, and less than a critical state, which is certain.
+enum class Severity { ok, warning, unknown, critical };
+
+constexpr int exit_usage = 64; // wrong usage: nothing was asked, nothing was done
+
+// 0 ok, 1 warning, 2 critical, 3 unknown.
+int exit_status(Severity severity);
+
+// "ok", "warning", "critical", "unknown": the words of the JSON form.
+std::string word(Severity severity);
+
+Severity worse(Severity a, Severity b);
+
+// Something that is not well, and how bad it is: "disk 3 is absent".
+struct Finding {
+    Severity severity = Severity::ok;
+    std::string text;
+};
+
+} // namespace zavctl

@@ -1,0 +1,33 @@
+#include "objects.h"
+
+#include "../system/platform.h"
+
+namespace zavctl {
+
+namespace {
+
+constexpr VerbHelp help = {
+    "Checks everything that the library needs of this system",
+    "Shown: one line per precondition with what was found and, where something is missing, what\n"
+    "that means for the answers: the shell, the model and its configuration, the tools and what\n"
+    "they answer, /proc/mdstat, device names, hot plug, the BIOS device, locks, the log, locale.\n"
+    "Warning: some functions or some arrays are affected.\n"
+    "Critical: states of disks and arrays cannot be trusted or told.\n"
+    "Nothing is changed; a tool that does not answer is given 10 seconds.",
+    "  zavctl doctor\n"
+    "  zavctl doctor --jsonl | jq -r 'select(.severity != \"ok\") | .check'",
+};
+
+} // namespace
+
+void add_doctor(CLI::App &root, Session &session) {
+    CLI::App *doctor = add_verb(root, session, "doctor", help);
+    doctor->callback([&session] {
+        session.action = [] {
+            const std::vector<Check> checks = platform_checks(read_platform(read_model()));
+            return Answer{"doctor", "", {doctor_section(checks)}};
+        };
+    });
+}
+
+} // namespace zavctl

@@ -1,0 +1,12 @@
+#include "objects.h"
+
+namespace zavctl {
+
+const std::vector<AddObject> &object_table() {
+    static const std::vector<AddObject> table = {
+        add_status, add_model, add_disk, add_array, add_bios, add_name, add_doctor,
+    };
+    return table;
+}
+
+} // namespace zavctl

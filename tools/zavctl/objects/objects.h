@@ -1,0 +1,45 @@
+// The objects of zavctl. A new one is a file with its add_ function and a line in objects.cpp;
+// what it has to say in `zavctl status` is a line in the table of status.cpp.
+#pragma once
+
+#include "../core/model_report.h"
+#include "session.h"
+
+#include <memory>
+
+#include <vector>
+
+namespace zavctl {
+
+// What is known of the machine before anything is asked about its devices.
+struct Machine {
+    ModelReport model;
+    std::string disk_doubt;  // why answers about disks cannot be trusted, "" if they can
+    std::string array_doubt; // why arrays give no answer, "" if nothing is known of it
+};
+
+ModelReport read_model();
+Machine read_machine();
+
+// Questions, and the section that shows their answers: called once all are asked.
+struct Survey {
+    std::vector<Question> questions;
+    std::function<Section()> report;
+};
+
+// Reports that a survey fills and others may look at.
+template <class Report>
+using Shared = std::shared_ptr<std::vector<Report>>;
+
+using AddObject = void (*)(CLI::App &root, Session &session);
+const std::vector<AddObject> &object_table();
+
+void add_status(CLI::App &root, Session &session);
+void add_model(CLI::App &root, Session &session);
+void add_disk(CLI::App &root, Session &session);
+void add_array(CLI::App &root, Session &session);
+void add_bios(CLI::App &root, Session &session);
+void add_name(CLI::App &root, Session &session);
+void add_doctor(CLI::App &root, Session &session);
+
+} // namespace zavctl

@@ -1,0 +1,47 @@
+#include "files.h"
+
+#include <algorithm>
+#include <array>
+#include <cerrno>
+#include <dirent.h>
+#include <fcntl.h>
+#include <memory>
+#include <unistd.h>
+
+namespace zavctl {
+
+namespace {
+
+constexpr std::size_t size_limit = 1U << 20U;
+
+} // namespace
+
+FileFact read_file(const std::string &path) {
+    FileFact file;
+    const int descriptor = open(path.c_str(), O_RDONLY | O_CLOEXEC);
+    if (descriptor < 0)
+        return {errno, ""};
+    std::array<char, 4096> piece{};
+    ssize_t got = 0;
+    while (file.text.size() < size_limit &&
+           (got = read(descriptor, piece.data(), piece.size())) > 0)
+        file.text.append(piece.data(), static_cast<std::size_t>(got));
+    file.error = got < 0 ? errno : 0;
+    close(descriptor);
+    return file;
+}
+
+std::vector<std::string> names_in(const std::string &directory, int &error) {
+    std::vector<std::string> names;
+    const std::unique_ptr<DIR, int (*)(DIR *)> stream(opendir(directory.c_str()), closedir);
+    error = stream ? 0 : errno;
+    if (!stream)
+        return names;
+    for (const dirent *entry = readdir(stream.get()); entry; entry = readdir(stream.get()))
+        if (const std::string name = entry->d_name; name != "." && name != "..")
+            names.push_back(name);
+    std::sort(names.begin(), names.end());
+    return names;
+}
+
+} // namespace zavctl

@@ -1,0 +1,17 @@
+// Files, read whole.
+#pragma once
+
+#include "../core/doctor.h"
+
+#include <string>
+#include <vector>
+
+namespace zavctl {
+
+// At most a megabyte of a file.
+FileFact read_file(const std::string &path);
+
+// The names in a directory, sorted; empty if it cannot be read (then `error` says why).
+std::vector<std::string> names_in(const std::string &directory, int &error);
+
+} // namespace zavctl

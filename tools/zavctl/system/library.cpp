@@ -1,0 +1,120 @@
+#include "library.h"
+
+#include <array>
+
+namespace zavctl::library {
+
+namespace {
+
+constexpr std::size_t name_size = 128;
+
+struct CodeMeaning {
+    int code;
+    const char *meaning;
+};
+
+constexpr CodeMeaning meanings[] = {
+    {ZAV_RC_ERR_ENOENT, "a file or device is missing"},
+    {ZAV_RC_ERR_ENOMEM, "a name is too long"},
+    {ZAV_RC_ERR_EACCES, "the device is in use by another program"},
+    {ZAV_RC_ERR_EBUSY, "the device is busy"},
+    {ZAV_RC_ERR_ENODEV, "no such device"},
+    {ZAV_RC_ERR_EINVAL, "the library does not take this address here"},
+    {ZAV_RC_ERR, "a step failed"},
+    {0x1001, "the saved file came out too short"},
+    {0x1301, "no known model"},
+};
+
+std::string meaning(int code) {
+    for (const CodeMeaning &entry : meanings)
+        if (entry.code == code)
+            return entry.meaning;
+    return "the library reports a failure";
+}
+
+// A code without a name gives "Not support[...]".
+std::string code_name(int code) {
+    std::array<char, name_size> buffer{};
+    const std::string name = zav_rcdef_to_str(code, buffer.data());
+    return name.starts_with("ZAV_") ? name : "";
+}
+
+// The readers take a buffer and leave it as it was when the file is empty.
+std::optional<std::string> identity(int (*read)(char *, int)) {
+    std::array<char, name_size> buffer{};
+    if (read(buffer.data(), static_cast<int>(buffer.size())) != ZAV_RC_OK)
+        return std::nullopt;
+    return std::string(buffer.data());
+}
+
+} // namespace
+
+ModelConfig model_config() {
+    ModelConfig config;
+    config.result = zavGetModelConfig(&config.model, &config.disk_slots, &config.disk_count);
+    return config;
+}
+
+int data_raid_type() {
+    return zavGetDataRaidtype();
+}
+
+std::optional<std::string> product_name() {
+    return identity(zavGetModelBIOS);
+}
+
+std::optional<std::string> serial_number() {
+    return identity(zavGetSerialBIOS);
+}
+
+NamedDevice device_of(const std::string &path) {
+    NamedDevice named;
+    named.result = zavStrToDev(path.c_str(), &named.device);
+    return named;
+}
+
+Address address_of(const zavDevice &device) {
+    std::array<char, name_size> buffer{};
+    zavDevice copy = device;
+    if (zavDevToStr(buffer.data(), buffer.size(), &copy) != ZAV_RC_OK)
+        return {device, ""};
+    return {device, buffer.data()};
+}
+
+int name_result(const zavDevice &device) {
+    std::array<char, name_size> buffer{};
+    zavDevice copy = device;
+    return zavDevToStr(buffer.data(), buffer.size(), &copy);
+}
+
+DiskAnswer disk_state(const zavDevice &device) {
+    DiskAnswer answer;
+    zavDevice copy = device;
+    answer.result = zavGetStateDisk(&copy, &answer.state);
+    return answer;
+}
+
+RaidAnswer raid_state(const zavDevice &device) {
+    RaidAnswer answer;
+    zavDevice copy = device;
+    answer.result = zavGetStateRaid(&copy, &answer.state);
+    return answer;
+}
+
+int save_bios(const std::string &file) {
+    std::string path = file;
+    return zavSaveBIOS(path.data());
+}
+
+int load_bios(const std::string &file) {
+    std::string path = file;
+    return zavLoadBIOS(path.data());
+}
+
+std::optional<Failure> failure_of(int result) {
+    if (result == ZAV_RC_OK)
+        return std::nullopt;
+    return Failure{result, code_name(result), meaning(result)};
+}
+
+} // namespace zavctl::library

@@ -1,0 +1,54 @@
+// The library's functions in C++ types: records and texts in and out, no buffers.
+#pragma once
+
+#include "../core/address.h"
+#include "../core/answer.h"
+
+#include "zav_api.h"
+
+#include <optional>
+#include <string>
+
+namespace zavctl::library {
+
+struct ModelConfig {
+    int result = 0;
+    int model = 0;
+    int disk_slots = 0;
+    int disk_count = 0;
+};
+
+struct NamedDevice {
+    int result = 0;
+    zavDevice device{};
+};
+
+struct DiskAnswer {
+    int result = 0;
+    zavHddState state{};
+};
+
+struct RaidAnswer {
+    int result = 0;
+    zavRaidState state{};
+};
+
+ModelConfig model_config();
+int data_raid_type();
+std::optional<std::string> product_name();
+std::optional<std::string> serial_number();
+
+NamedDevice device_of(const std::string &path);
+Address address_of(const zavDevice &device); // path "" if it has no name
+int name_result(const zavDevice &device);    // what the library says to the conversion
+
+DiskAnswer disk_state(const zavDevice &device);
+RaidAnswer raid_state(const zavDevice &device);
+
+int save_bios(const std::string &file);
+int load_bios(const std::string &file);
+
+// The name of a result code and its meaning in words; nothing for ZAV_RC_OK.
+std::optional<Failure> failure_of(int result);
+
+} // namespace zavctl::library

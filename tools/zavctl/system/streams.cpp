@@ -1,0 +1,119 @@
+#include "streams.h"
+
+#include <sys/ioctl.h>
+
+#include <cerrno>
+#include <csignal>
+#include <cstdio>
+#include <cstdlib>
+#include <fcntl.h>
+#include <string_view>
+#include <unistd.h>
+
+namespace zavctl {
+
+namespace {
+
+// A closed descriptor below 3 would be taken by the next file that anybody opens.
+void occupy(int descriptor) {
+    if (fcntl(descriptor, F_GETFD) >= 0)
+        return;
+    const int null = open("/dev/null", O_RDWR);
+    if (null >= 0 && null != descriptor) {
+        dup2(null, descriptor);
+        close(null);
+    }
+}
+
+int private_copy(int descriptor) {
+    return fcntl(descriptor, F_DUPFD_CLOEXEC, 3);
+}
+
+// Ignored in zavctl alone: a handler, unlike SIG_IGN, is not handed on to the tools.
+void survive_closed_pipes() {
+    struct sigaction action {};
+    action.sa_handler = [](int) {};
+    action.sa_flags = SA_RESTART;
+    sigaction(SIGPIPE, &action, nullptr);
+}
+
+bool environment_says(const char *name) {
+    const char *value = std::getenv(name);
+    return value != nullptr && *value != '\0';
+}
+
+bool terminal_is_dumb() {
+    const char *term = std::getenv("TERM");
+    return term == nullptr || std::string_view(term) == "dumb";
+}
+
+std::size_t terminal_width(int descriptor) {
+    winsize size{};
+    if (ioctl(descriptor, TIOCGWINSZ, &size) != 0)
+        return 0;
+    return size.ws_col;
+}
+
+} // namespace
+
+Streams::Streams() {
+    out_ = private_copy(STDOUT_FILENO); // -1 when the caller closed it: writing then fails
+    in_ = private_copy(STDIN_FILENO);
+    for (const int descriptor : {STDIN_FILENO, STDOUT_FILENO, STDERR_FILENO})
+        occupy(descriptor);
+    dup2(STDERR_FILENO, STDOUT_FILENO);
+    const int null = open("/dev/null", O_RDONLY | O_CLOEXEC);
+    if (null >= 0) {
+        dup2(null, STDIN_FILENO);
+        close(null);
+    }
+    survive_closed_pipes();
+}
+
+int Streams::write(const std::string &text) const {
+    std::string_view rest = text;
+    while (!rest.empty()) {
+        const ssize_t done = ::write(out_, rest.data(), rest.size());
+        if (done < 0 && errno != EINTR)
+            return errno;
+        rest.remove_prefix(done < 0 ? 0 : static_cast<std::size_t>(done));
+    }
+    return 0;
+}
+
+void Streams::say(const std::string &text) const {
+    std::fputs(text.c_str(), stderr);
+    std::fflush(stderr);
+}
+
+bool Streams::confirm(const std::string &question) const {
+    say(question + " [y/N] ");
+    std::string line;
+    char c = 0;
+    while (::read(in_, &c, 1) == 1 && c != '\n')
+        line += c;
+    line = trimmed(line);
+    return line == "y" || line == "Y" || line == "yes" || line == "Yes";
+}
+
+bool Streams::can_ask() const {
+    return isatty(in_) == 1 && err_is_terminal();
+}
+
+bool Streams::out_is_terminal() const {
+    return isatty(out_) == 1;
+}
+
+bool Streams::err_is_terminal() const {
+    return isatty(STDERR_FILENO) == 1;
+}
+
+Style Streams::style(const std::string &when) const {
+    Style style;
+    const bool wanted = out_is_terminal() && !environment_says("NO_COLOR") && !terminal_is_dumb();
+    style.colour = when == "always" || (when == "auto" && wanted);
+    style.width = out_is_terminal() ? terminal_width(out_) : 0;
+    return style;
+}
+
+} // namespace zavctl

@@ -1,0 +1,38 @@
+// zavctl's own input and output, kept apart from what the library and its tools print and read.
+#pragma once
+
+#include "../core/text.h"
+
+#include <string>
+
+namespace zavctl {
+
+// To be made first of all: afterwards descriptor 1 is standard error, so that nothing but
+// zavctl's answer reaches standard output, and descriptor 0 is /dev/null, so that no tool eats
+// the caller's input.
+class Streams {
+  public:
+    Streams();
+
+    // Writes the whole text to the real standard output. 0, or errno of the failure.
+    int write(const std::string &text) const;
+
+    // A message for the person at the terminal, on standard error.
+    void say(const std::string &text) const;
+
+    // Asks on standard error, reads a line from the real standard input: true for y or yes.
+    bool confirm(const std::string &question) const;
+
+    bool can_ask() const; // standard input and error are terminals
+    bool out_is_terminal() const;
+    bool err_is_terminal() const;
+
+    // Colours and width for the real standard output. `when` is auto, always or never.
+    Style style(const std::string &when) const;
+
+  private:
+    int out_ = -1;
+    int in_ = -1;
+};
+
+} // namespace zavctl
