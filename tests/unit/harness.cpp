@@ -1,0 +1,202 @@
+#include "harness.h"
+
+#include <cerrno>
+#include <cstdarg>
+#include <cstdio>
+#include <dlfcn.h>
+#include <filesystem>
+#include <fstream>
+#include <sstream>
+#include <sys/sem.h>
+#include <sys/wait.h>
+#include <syslog.h>
+#include <unistd.h>
+
+namespace fs = std::filesystem;
+
+namespace harness {
+
+namespace {
+
+std::string log_ident;
+int log_options;
+int log_facility;
+
+template <typename Function>
+Function *real(const char *name) {
+    return reinterpret_cast<Function *>(dlsym(RTLD_NEXT, name));
+}
+
+} // namespace
+
+LogRow row(const std::string &ident, int priority, const std::string &text) {
+    return {ident, LOG_CONS | LOG_PID, LOG_DAEMON, priority, text};
+}
+
+std::ostream &operator<<(std::ostream &out, const LogRow &row) {
+    return out << row.ident << " options " << row.options << " facility " << row.facility
+               << " priority " << row.priority << ": " << row.text;
+}
+
+Record &record() {
+    static Record the_record;
+    return the_record;
+}
+
+// What tests put into the root. The bare root itself comes with the directories.
+constexpr const char *kWipedDirectories[] = {"/etc/Kiru",      "/proc/zav", "/proc/scsi",
+                                             "/sys/class",     "/dev/sata", "/dev/swraid",
+                                             "/dev/iscsiraid", "/scratch"};
+constexpr const char *kWipedFiles[] = {"/proc/mdstat",
+                                       "/dev/nvram",
+                                       "/dev/mem",
+                                       "/sbin/mdadm",
+                                       "/bin/smartctl",
+                                       "/etc/sysconfig/clock",
+                                       "/etc/arecaTimeZone.list",
+                                       "/usr/bin/syncConf.sh"};
+
+// The tests wipe directories of the system: never outside a private root.
+void require_private_root() {
+    static const bool private_root = fs::exists("/run/zavsim");
+    if (!private_root) {
+        fputs("unit_tests: run me as: zavsim --bare -- unit_tests\n", stderr);
+        _exit(1);
+    }
+}
+
+Appliance::Appliance() {
+    require_private_root();
+    for (const char *path : kWipedDirectories) {
+        fs::remove_all(path);
+        fs::create_directories(path);
+    }
+    for (const char *path : kWipedFiles)
+        fs::remove(path);
+    for (const int key : {0x6911, 0x6912, 0x3231}) {
+        const int id = semget(key, 1, 0);
+        if (id >= 0)
+            semctl(id, 0, IPC_RMID);
+    }
+    record() = {};
+}
+
+void Appliance::put(const std::string &path, const std::string &text) {
+    fs::create_directories(fs::path(path).parent_path());
+    std::ofstream(path, std::ios::binary) << text;
+}
+
+void Appliance::script(const std::string &path, const std::string &body) {
+    put(path, "#!/bin/bash\n" + body);
+    fs::permissions(path, fs::perms::owner_all);
+}
+
+void Appliance::tool(const std::string &path, const std::string &output, int status) {
+    put("/scratch/answer-of-" + fs::path(path).filename().string(), output);
+    script(path, "cat /scratch/answer-of-${0##*/}; exit " + std::to_string(status) + "\n");
+}
+
+void Appliance::remove(const std::string &path) {
+    fs::remove_all(path);
+}
+
+std::string Appliance::get(const std::string &path) {
+    std::ostringstream text;
+    text << std::ifstream(path, std::ios::binary).rdbuf();
+    return text.str();
+}
+
+void Appliance::model(const std::string &product, const std::string &raidtype) {
+    put("/sys/class/dmi/id/product_name", product);
+    put("/etc/Kiru/raidtype", raidtype);
+}
+
+size_t Appliance::open_descriptors() {
+    size_t count = 0;
+    for (const auto &entry : fs::directory_iterator("/proc/self/fd"))
+        count += entry.path().empty() ? 0U : 1U;
+    return count;
+}
+
+bool Appliance::has_children() {
+    return waitpid(-1, nullptr, WNOHANG) != -1;
+}
+
+std::string data(const std::string &path) {
+    std::ifstream file(std::string(ZAV_TEST_DATA) + "/" + path, std::ios::binary);
+    EXPECT_TRUE(file) << path;
+    std::ostringstream text;
+    text << file.rdbuf();
+    return text.str();
+}
+
+} // namespace harness
+
+std::ostream &operator<<(std::ostream &out, const zavDevice &dev) {
+    return out << "{" << dev.type << ", 0x" << std::hex << dev.minor_type << std::dec << ", "
+               << dev.disk << ", " << dev.part << "}";
+}
+
+// The functions of the C library through which commands are run, time passes and lines are logged:
+// the library's calls come here.
+extern "C" {
+
+int system(const char *command) {
+    harness::record().commands.emplace_back(command);
+    if (harness::record().system_status)
+        return *harness::record().system_status;
+    return harness::real<int(const char *)>("system")(command);
+}
+
+FILE *popen(const char *command, const char *mode) {
+    harness::record().commands.emplace_back(command);
+    if (harness::record().popen_fails) {
+        errno = EMFILE;
+        return nullptr;
+    }
+    return harness::real<FILE *(const char *, const char *)>("popen")(command, mode);
+}
+
+unsigned sleep(unsigned seconds) {
+    harness::record().sleeps.push_back(seconds);
+    if (harness::record().during_sleep)
+        harness::record().during_sleep(harness::record().sleeps.size());
+    return 0;
+}
+
+int usleep(useconds_t microseconds) {
+    harness::record().short_sleeps.push_back(microseconds);
+    if (harness::record().during_short_sleep)
+        harness::record().during_short_sleep();
+    return 0;
+}
+
+int semget(key_t key, int semaphores, int flags) {
+    harness::record().semget_flags.push_back(flags);
+    if (harness::record().semget_fails) {
+        errno = ENOSPC;
+        return -1;
+    }
+    return harness::real<int(key_t, int, int)>("semget")(key, semaphores, flags);
+}
+
+void openlog(const char *ident, int options, int facility) {
+    harness::log_ident = ident;
+    harness::log_options = options;
+    harness::log_facility = facility;
+}
+
+void syslog(int priority, const char *format, ...) {
+    char text[1024];
+    va_list arguments;
+    va_start(arguments, format);
+    vsnprintf(text, sizeof text, format, arguments);
+    va_end(arguments);
+    harness::record().log.push_back(
+        {harness::log_ident, harness::log_options, harness::log_facility, priority, text});
+}
+
+void closelog(void) {
+    harness::log_ident = "(the log is closed)";
+}
+}

@@ -1,0 +1,79 @@
+// The unit tests' appliance: a private root that each test fills with scripted answers, and a
+// record of what the library asked of the system.
+#pragma once
+
+#include "zav_api.h"
+
+#include <functional>
+#include <gtest/gtest.h>
+#include <optional>
+#include <string>
+#include <vector>
+
+namespace harness {
+
+struct LogRow {
+    std::string ident;
+    int options;
+    int facility;
+    int priority;
+    std::string text;
+
+    bool operator==(const LogRow &) const = default;
+};
+
+// A row as the library writes all of its rows.
+LogRow row(const std::string &ident, int priority, const std::string &text);
+
+std::ostream &operator<<(std::ostream &out, const LogRow &row);
+
+// What the library did since the test began.
+struct Record {
+    std::vector<std::string> commands; // run by system or popen, in order
+    std::vector<LogRow> log;
+    std::vector<unsigned> sleeps;             // seconds
+    std::vector<unsigned> short_sleeps;       // microseconds
+    std::function<void(size_t)> during_sleep; // told how many sleeps there were, this one included
+    std::function<void()> during_short_sleep;
+    std::optional<int> system_status; // what system() answers instead of running the command
+    bool popen_fails = false;
+    std::vector<int> semget_flags;
+    bool semget_fails = false;
+};
+
+Record &record();
+
+// A fresh appliance for each test: nothing of an earlier test is left in the root.
+class Appliance : public ::testing::Test {
+  protected:
+    Appliance();
+
+    // A file with its directories.
+    static void put(const std::string &path, const std::string &text);
+    // An executable that prints `output` and ends with `status`.
+    static void tool(const std::string &path, const std::string &output, int status = 0);
+    static void script(const std::string &path, const std::string &body);
+    static void remove(const std::string &path);
+    static std::string get(const std::string &path);
+
+    // BIOS product name and raidtype line, as they stand in their files.
+    static void model(const std::string &product, const std::string &raidtype);
+    static void four_disk_model() { model("SV-2860\n", "raidtype=5;0;4\n"); }
+    static void two_disk_model() { model("SV-2740\n", "raidtype=1;0;2\n"); }
+
+    // Number of descriptors that the process has open.
+    static size_t open_descriptors();
+    // Is there a child that was not waited for?
+    static bool has_children();
+};
+
+// A text of tests/data.
+std::string data(const std::string &path);
+
+} // namespace harness
+
+inline bool operator==(const zavDevice &a, const zavDevice &b) {
+    return a.type == b.type && a.minor_type == b.minor_type && a.disk == b.disk && a.part == b.part;
+}
+
+std::ostream &operator<<(std::ostream &out, const zavDevice &dev);
