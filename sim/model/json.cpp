@@ -35,8 +35,8 @@ NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(Member, slot, serial, letter, partition, numb
                                    role)
 NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(Sync, kind, order, started, running, pending, done_kib)
 NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(Array, minor, name, level, metadata, raid_devices, chunk_kib,
-                                   component_kib, uuid, created, updated, events, bitmap, inactive,
-                                   auto_read_only, sync, members)
+                                   component_kib, uuid, created, updated, events, bitmap, dirty,
+                                   inactive, auto_read_only, sync, members)
 NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(ToolFault, tool, hangs, prints, exits, missing)
 NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(Event, at, sentence)
 NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(State, model, current_tools, time_scale, real_start, now,

@@ -70,6 +70,7 @@ struct Array {
     double updated = 0;
     int events = 0;
     bool bitmap = false;
+    bool dirty = false; // writes are under way
     bool inactive = false;
     bool auto_read_only = false;
     Sync sync;

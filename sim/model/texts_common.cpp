@@ -42,8 +42,9 @@ std::string date_text(double appliance_time) {
 }
 
 std::uint64_t sync_done_kib(const Array &array) {
-    // The kernel moves in steps of 128 KiB.
-    return static_cast<std::uint64_t>(array.sync.done_kib) / 128 * 128;
+    // The kernel moves in steps of 128 KiB; a sum of many small times may fall short of one by a
+    // hair.
+    return static_cast<std::uint64_t>(array.sync.done_kib + 1e-3) / 128 * 128;
 }
 
 int sync_percent(const Array &array) {

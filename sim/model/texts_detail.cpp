@@ -41,12 +41,31 @@ std::string sync_words(const Array &array) {
     return words.at(sync.kind);
 }
 
+bool has_node(const State &state, const Member &member) {
+    const Disk *disk = attached_disk(state, member.letter);
+    return disk != nullptr && disk->serial == member.serial;
+}
+
+// The current mdadm judges by the members whose nodes it finds, whatever the kernel still holds.
+bool looks_broken(const State &state, const Array &array) {
+    if (!state.current_tools)
+        return is_broken(array);
+    Array found = array;
+    for (Member &member : found.members)
+        if (!has_node(state, member))
+            member.role = Role::faulty;
+    return is_broken(found);
+}
+
 // The blank at the end is mdadm's.
 std::string state_words(const State &state, const Array &array) {
-    const char *health = is_broken(array) ? ", FAILED" : is_degraded(array) ? ", degraded" : "";
-    const std::string old_end = array.sync.kind == SyncKind::none && !is_degraded(array) ? "" : " ";
-    return std::string("clean") + health + sync_words(array) +
-           (state.current_tools ? " " : old_end);
+    const char *health = looks_broken(state, array) ? ", FAILED"
+                         : is_degraded(array)       ? ", degraded"
+                                                    : "";
+    const std::string words =
+        std::string(array.dirty ? "active" : "clean") + health + sync_words(array);
+    const bool undisturbed = words == "clean" || words == "active";
+    return words + (undisturbed && !state.current_tools ? "" : " ");
 }
 
 void sizes(Sheet &sheet, const Array &array) {
@@ -116,8 +135,7 @@ void identity(Sheet &sheet, const Array &array) {
 }
 
 std::string device_path(const State &state, const Member &member) {
-    const Disk *disk = attached_disk(state, member.letter);
-    if (disk == nullptr || disk->serial != member.serial)
+    if (!has_node(state, member))
         return state.current_tools ? "   missing" : "";
     return fmt::format("   /dev/sd{}{}", member.letter, member.partition);
 }

@@ -5,11 +5,25 @@
 
 namespace zavsim {
 
+namespace {
+
+// The oldest superblocks have no name, so that the kernel's stands in its place.
+std::string old_superblock_text(const State &state, const Array &array) {
+    const std::string level = state.current_tools ? ""
+                                                  : fmt::format("level={} num-devices={} ",
+                                                                array.level, array.raid_devices);
+    return fmt::format("ARRAY /dev/md{} {}UUID={}\n", array.minor, level, array.uuid);
+}
+
+} // namespace
+
 std::string examine_scan_text(const State &state, const Partition &partition) {
     const Array *array =
         partition.superblock ? array_of_uuid(state, partition.superblock->uuid) : nullptr;
     if (array == nullptr)
         return {};
+    if (array->metadata == "0.90")
+        return old_superblock_text(state, *array);
     if (state.current_tools)
         return fmt::format("ARRAY /dev/md/{}  metadata={} UUID={} name=appliance:{}\n", array->name,
                            array->metadata, array->uuid, array->name);

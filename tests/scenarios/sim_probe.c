@@ -1,0 +1,92 @@
+/* Calls what the preloaded shim stands in for and prints what came of it, one fact a line. */
+#include <errno.h>
+#include <fcntl.h>
+#include <stdio.h>
+#include <stdlib.h>
+#include <string.h>
+#include <sys/ioctl.h>
+#include <time.h>
+#include <unistd.h>
+
+static int open_device(const char *path) {
+    return open(path, O_RDWR | O_EXCL | O_NOCTTY);
+}
+
+static const char *verdict(int result) {
+    return result >= 0 ? "ok" : strerror(errno);
+}
+
+static void print_seconds(double from) {
+    struct timespec now;
+    clock_gettime(CLOCK_MONOTONIC, &now);
+    printf("%.3f\n", (double)now.tv_sec + (double)now.tv_nsec * 1e-9 - from);
+}
+
+static double seconds_now(void) {
+    struct timespec now;
+    clock_gettime(CLOCK_MONOTONIC, &now);
+    return (double)now.tv_sec + (double)now.tv_nsec * 1e-9;
+}
+
+static void probe_sleep(void) {
+    const struct timespec one = {1, 0};
+    const double start = seconds_now();
+    sleep(1);
+    usleep(999999);
+    nanosleep(&one, NULL);
+    clock_nanosleep(CLOCK_MONOTONIC, 0, &one, NULL);
+    print_seconds(start);
+}
+
+static void probe_exclusive(const char *path) {
+    const int first = open_device(path);
+    printf("first %s\n", verdict(first));
+    printf("second %s\n", verdict(open_device(path)));
+    close(first);
+    printf("after closing %s\n", verdict(open_device(path)));
+}
+
+static void probe_queue(const char *path, size_t size) {
+    static unsigned char record[872];
+    const int device = open_device(path);
+    int put = 0;
+    int same = 0;
+    printf("empty %s\n", verdict(ioctl(device, 2, record)));
+    for (; put < 100; ++put) {
+        memset(record, put, size);
+        if (ioctl(device, 1, record) != 0)
+            break;
+    }
+    printf("put %d, then %s\n", put, verdict(-1));
+    for (int i = 0; i < put; ++i) {
+        memset(record, 0xEE, sizeof record);
+        same += ioctl(device, 2, record) == 0 && record[0] == i && record[size - 1] == i;
+    }
+    printf("taken in order %d\n", same);
+    printf("then %s\n", verdict(ioctl(device, 2, record)));
+}
+
+static void probe_private(void) {
+    static unsigned char record[872];
+    int count = -1;
+    const int device = open_device("/dev/zavevent0");
+    const int counted = ioctl(device, 0x20, &count);
+    printf("count %s %d\n", verdict(counted), count);
+    const int taken = ioctl(device, 0x10, record);
+    printf("take %s %d\n", verdict(taken), record[871]);
+}
+
+int main(int argc, char **argv) {
+    const char *what = argc > 1 ? argv[1] : "";
+    if (strcmp(what, "sleep") == 0)
+        probe_sleep();
+    else if (strcmp(what, "exclusive") == 0 && argc == 3)
+        probe_exclusive(argv[2]);
+    else if (strcmp(what, "queue") == 0 && argc == 4)
+        probe_queue(argv[2], (size_t)atoi(argv[3]));
+    else if (strcmp(what, "private") == 0)
+        probe_private();
+    else
+        return 2;
+    return 0;
+}
