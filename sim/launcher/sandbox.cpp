@@ -133,6 +133,8 @@ Words bubblewrap_arguments(const Options &options, const fs::path &self) {
     bind_libraries(args);
     add(args, {"--symlink", "usr/bin", "/bin", "--symlink", "usr/sbin", "/sbin"});
     add(args, {"--dev", "/dev", "--proc", place::real_proc, "--tmpfs", "/tmp"});
+    // The init step fills /proc, but a sanitized build of it looks at itself before it begins.
+    add(args, {"--symlink", place::real_proc + "/self", "/proc/self"});
     bind_user_directories(args);
     bind_program(args, self);
     bind_program(args, resolved_command(options.command.front()));

@@ -1,13 +1,10 @@
 #include "root/background.hpp"
 
-#include "model/actions.hpp"
-#include "model/texts.hpp"
 #include "root/files.hpp"
 #include "root/store.hpp"
 
 #include <array>
 #include <csignal>
-#include <cstring>
 #include <ctime>
 #include <fmt/format.h>
 #include <fstream>
@@ -29,7 +26,7 @@ int open_log_socket() {
     const int fd = socket(AF_UNIX, SOCK_DGRAM | SOCK_CLOEXEC | SOCK_NONBLOCK, 0);
     sockaddr_un address{};
     address.sun_family = AF_UNIX;
-    strcpy(address.sun_path, "/dev/log");
+    std::string("/dev/log").copy(address.sun_path, sizeof address.sun_path - 1);
     if (fd < 0 || bind(fd, reinterpret_cast<const sockaddr *>(&address), sizeof address) != 0)
         throw std::system_error(errno, std::generic_category(), "/dev/log");
     return fd;
@@ -50,13 +47,6 @@ void drain_log(int log_socket) {
     }
 }
 
-// A command stays in the file until it is taken; the list then replaces it.
-void take_scsi_command(State &state) {
-    const auto text = read_text("/proc/scsi/scsi");
-    if (text && text->rfind("scsi ", 0) == 0)
-        scsi_command(state, *text);
-}
-
 void write_notes(State &state) {
     for (const std::string &note : state.notes)
         append_log(fmt::format("<6>zavsim: at {:.1f}s: {}", state.now, note));
@@ -65,7 +55,6 @@ void write_notes(State &state) {
 
 void tick() {
     Turn turn;
-    take_scsi_command(turn.state());
     write_notes(turn.state());
     turn.commit();
 }

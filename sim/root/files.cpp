@@ -37,6 +37,14 @@ void write_text(const fs::path &path, const std::string &text) {
     fs::rename(fresh, path);
 }
 
+void overwrite_text(const fs::path &path, const std::string &text) {
+    const Descriptor file(open(path.c_str(), O_WRONLY | O_CREAT | O_CLOEXEC, 0660));
+    const auto size = static_cast<ssize_t>(text.size());
+    if (file.get() < 0 || pwrite(file.get(), text.data(), text.size(), 0) != size ||
+        ftruncate(file.get(), size) != 0)
+        throw std::system_error(errno, std::generic_category(), path);
+}
+
 void point_link(const fs::path &link, const std::string &target) {
     std::error_code error;
     if (fs::read_symlink(link, error) == target && !error)

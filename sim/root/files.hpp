@@ -14,6 +14,10 @@ std::optional<std::string> read_text(const std::filesystem::path &path);
 // file alone.
 void write_text(const std::filesystem::path &path, const std::string &text);
 
+// Writes a file that others write to as well, in place: whoever has it open still reaches it. At
+// no moment is it shorter than the old text and the new.
+void overwrite_text(const std::filesystem::path &path, const std::string &text);
+
 // Makes or corrects a symbolic link.
 void point_link(const std::filesystem::path &link, const std::string &target);
 

@@ -6,6 +6,7 @@
 #include "root/files.hpp"
 #include "tools/tools.hpp"
 
+#include <chrono>
 #include <filesystem>
 #include <map>
 #include <nlohmann/json.hpp>
@@ -112,11 +113,30 @@ void publish_tools(const State &state) {
     }
 }
 
+constexpr const char *scsi_file = "/proc/scsi/scsi";
+
+bool is_fresh(const fs::path &path) {
+    return fs::file_time_type::clock::now() - fs::last_write_time(path) < std::chrono::seconds(1);
+}
+
+// Whether a writer has the file: a command that nobody took yet, or emptied for one to come.
+bool belongs_to_writer(const std::string &text, const std::string &taken_command) {
+    return text.empty() ? is_fresh(scsi_file)
+                        : text.rfind("scsi ", 0) == 0 && text != taken_command;
+}
+
+// One look decides: a writer may come between two.
+void publish_scsi(const std::string &list, const std::string &taken_command) {
+    const auto present = read_text(scsi_file);
+    if (!present || (*present != list && !belongs_to_writer(*present, taken_command)))
+        overwrite_text(scsi_file, list);
+}
+
 } // namespace
 
-void publish(const State &state) {
+void publish(const State &state, const std::string &taken_command) {
     write_text("/proc/mdstat", mdstat_text(state));
-    write_text("/proc/scsi/scsi", scsi_text(state));
+    publish_scsi(scsi_text(state), taken_command);
     publish_devices(state);
     publish_ports();
     publish_tools(state);

@@ -3,8 +3,12 @@
 
 #include "model/state.hpp"
 
+#include <string>
+
 namespace zavsim {
 
-void publish(const State &state);
+// `taken_command` is what was found in /proc/scsi/scsi and acted on; another one that has come
+// since stays there for the next turn.
+void publish(const State &state, const std::string &taken_command);
 
 } // namespace zavsim

@@ -1,6 +1,7 @@
 #include "root/store.hpp"
 
 #include "launcher/sandbox.hpp"
+#include "model/actions.hpp"
 #include "model/advance.hpp"
 #include "model/factory.hpp"
 #include "model/json.hpp"
@@ -41,15 +42,25 @@ State load() {
     return state_from_text(*text);
 }
 
+// A command stays in the file until it is taken; the list of devices then replaces it.
+std::string take_scsi_command(State &state) {
+    const auto text = read_text("/proc/scsi/scsi");
+    if (!text || text->rfind("scsi ", 0) != 0)
+        return {};
+    scsi_command(state, *text);
+    return *text;
+}
+
 } // namespace
 
 Turn::Turn() : lock_(open_locked()), state_(load()) {
     advance(state_, (machine_seconds() - state_.real_start) * state_.time_scale);
+    taken_command_ = take_scsi_command(state_);
 }
 
 void Turn::commit() {
     write_text(state_file, to_text(state_));
-    publish(state_);
+    publish(state_, taken_command_);
 }
 
 void start_model(const Options &options) {
@@ -58,7 +69,7 @@ void start_model(const Options &options) {
     state.real_start = machine_seconds();
     state.scenario = parse_scenario(options.scenario, options.scenario_file).events;
     write_text(state_file, to_text(state));
-    publish(state);
+    publish(state, {});
 }
 
 } // namespace zavsim

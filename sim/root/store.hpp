@@ -5,6 +5,8 @@
 #include "model/state.hpp"
 #include "root/files.hpp"
 
+#include <string>
+
 namespace zavsim {
 
 // Writes the first state and everything that shows it.
@@ -21,6 +23,7 @@ class Turn {
   private:
     Descriptor lock_;
     State state_;
+    std::string taken_command_;
 };
 
 } // namespace zavsim

@@ -236,6 +236,11 @@ struct Capture {
     std::string block; // compare this array's block alone
 };
 
+// Names the case in a test's report.
+void PrintTo(const Capture &capture, std::ostream *out) {
+    *out << capture.file;
+}
+
 using Captures = std::vector<Capture>;
 
 Capture mdstat(const std::string &folder, const std::function<State()> &state,
