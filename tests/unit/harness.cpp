@@ -7,7 +7,9 @@
 #include <filesystem>
 #include <fstream>
 #include <sstream>
+#include <sys/mman.h>
 #include <sys/sem.h>
+#include <sys/syscall.h>
 #include <sys/wait.h>
 #include <syslog.h>
 #include <unistd.h>
@@ -157,6 +159,11 @@ FILE *popen(const char *command, const char *mode) {
     return harness::real<FILE *(const char *, const char *)>("popen")(command, mode);
 }
 
+int pclose(FILE *pipe) {
+    ++harness::record().pcloses;
+    return harness::real<int(FILE *)>("pclose")(pipe);
+}
+
 unsigned sleep(unsigned seconds) {
     harness::record().sleeps.push_back(seconds);
     if (harness::record().during_sleep)
@@ -169,6 +176,23 @@ int usleep(useconds_t microseconds) {
     if (harness::record().during_short_sleep)
         harness::record().during_short_sleep();
     return 0;
+}
+
+int fprintf(FILE *file, const char *format, ...) {
+    if (harness::record().fprintf_fails) {
+        errno = EIO;
+        return -1;
+    }
+    va_list arguments;
+    va_start(arguments, format);
+    const int count = vfprintf(file, format, arguments);
+    va_end(arguments);
+    return count;
+}
+
+int munmap(void *address, size_t size) noexcept {
+    const auto rc = static_cast<int>(syscall(SYS_munmap, address, size));
+    return harness::record().munmap_fails ? -1 : rc;
 }
 
 int semget(key_t key, int semaphores, int flags) {

@@ -37,8 +37,11 @@ struct Record {
     std::function<void()> during_short_sleep;
     std::optional<int> system_status; // what system() answers instead of running the command
     bool popen_fails = false;
+    int pcloses = 0; // pipes closed as pipes
     std::vector<int> semget_flags;
     bool semget_fails = false;
+    bool fprintf_fails = false;
+    bool munmap_fails = false;
 };
 
 Record &record();

@@ -79,6 +79,14 @@ TEST_F(BiosSettings, ThatDoNotFitOnTheDiskAreAnError) {
     expect(run(zavSaveBIOS, "/dev/full"), 128, "fwrite error");
 }
 
+TEST_F(BiosSettings, InAFileWithoutALengthAreAnError) {
+    put("/dev/nvram", settings());
+    ASSERT_EQ(mkfifo("/scratch/saved", 0600), 0);
+    const int reader = open("/scratch/saved", O_RDONLY | O_NONBLOCK);
+    expect(run(zavSaveBIOS, "/scratch/saved"), 0x1001, "file length error, len = -1\n");
+    close(reader);
+}
+
 TEST_F(BiosSettings, OfADeviceThatCannotBeReadAreSavedAsZeros) {
     remove("/dev/nvram");
     put("/dev/nvram/is/a/directory", ""); // opens, and fails to read
@@ -332,6 +340,26 @@ TEST_F(PhysicalMemory, ThatCannotBeOpenedGivesNull) {
     testing::internal::CaptureStdout();
     EXPECT_EQ(entry(1), "(null)");
     EXPECT_EQ(testing::internal::GetCapturedStdout(), "file open error");
+}
+
+TEST_F(PhysicalMemory, ThatCannotBeSoughtLeavesTheResult) {
+    put("/dev/mem", memory(0));
+    ASSERT_EQ(entry(1), "SV-2860");
+    remove("/dev/mem");
+    ASSERT_EQ(mkfifo("/dev/mem", 0600), 0);
+    const int writer = open("/dev/mem", O_RDWR);
+    testing::internal::CaptureStdout();
+    EXPECT_EQ(entry(2), "SV-2860");
+    EXPECT_EQ(testing::internal::GetCapturedStdout(), "lseek error");
+    close(writer);
+}
+
+TEST_F(PhysicalMemory, AFailedUnmappingIsToldAndHarmless) {
+    put("/dev/mem", memory(0));
+    record().munmap_fails = true;
+    testing::internal::CaptureStdout();
+    EXPECT_EQ(entry(2), "BOARD-SERIAL-NUMBER-");
+    EXPECT_EQ(testing::internal::GetCapturedStdout(), "munmap error");
 }
 
 TEST_F(PhysicalMemory, AnImageThatEndsBeforeTheTableIsNotTouchedBehindItsEnd) {

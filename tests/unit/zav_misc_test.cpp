@@ -257,6 +257,14 @@ TEST_F(SerialPort, AMissingLineIsToldByItsPath) {
     }
 }
 
+TEST_F(SerialPort, AFailedWriteIsLogged) {
+    const size_t open_before = open_descriptors();
+    record().fprintf_fails = true;
+    EXPECT_EQ(zavUARTMode(1), 128);
+    EXPECT_EQ(record().log, std::vector{row("zavUARTMode", 1, "[-1] Can't write GPIO")});
+    EXPECT_EQ(open_descriptors(), open_before);
+}
+
 class TimeZone : public harness::Appliance {
   protected:
     static void zone(const std::string &text) { put("/etc/sysconfig/clock", text); }

@@ -81,6 +81,7 @@ TEST_F(Array, ThatIsWholeIsNormal) {
     EXPECT_EQ(ask(kArray2), ZAV_RC_OK);
     expect(kArray2, ZAV_RAID_NORMAL, ZAV_RAIDLVL_5, 4, 0.0F);
     expect_members(4, 2);
+    EXPECT_EQ(record().pcloses, 1);
     EXPECT_EQ(record().commands, std::vector<std::string>{"/sbin/mdadm --detail /dev/md1"});
     EXPECT_TRUE(record().log.empty());
     EXPECT_TRUE(record().sleeps.empty());
@@ -120,10 +121,11 @@ TEST_F(Array, CountsTheModelsMembersNotMdadms) {
 }
 
 TEST_F(Array, WithoutActiveDevicesLineHasNone) {
-    array("raid5", 4, "[4/3] [UUU_]");
+    two_disk_model();
+    array("raid5", 2, "[2/1] [U_]");
     mdadm("     Raid Level : raid5\n");
     EXPECT_EQ(ask(kArray2), ZAV_RC_OK);
-    expect(kArray2, ZAV_RAID_FAILED, ZAV_RAIDLVL_5, 4, 0.0F);
+    expect(kArray2, ZAV_RAID_FAILED, ZAV_RAIDLVL_5, 2, 0.0F);
 }
 
 TEST_F(Array, ThatRebuildsIsInResyncWhateverIsLost) {
@@ -268,6 +270,14 @@ TEST_F(Array, AnUnsupportedLevelEndsTheReadingOfMdadm) {
     script("/sbin/mdadm",
            "echo '     Raid Level : raid6'; head -c 300000 /dev/zero | tr '\\0' x\n");
     EXPECT_EQ(ask(kArray2), ZAV_RC_ERR_EINVAL);
+    EXPECT_EQ(record().pcloses, 0); // it is closed like a file
+}
+
+TEST_F(Array, OfAnUnsupportedLevelKeepsTheCountReadBeforeIt) {
+    array("raid6", 4, "");
+    mdadm("   Raid Devices : 7\n     Raid Level : raid6\n");
+    EXPECT_EQ(ask(kArray2), ZAV_RC_ERR_EINVAL);
+    expect(kArray2, 0, ZAV_RAIDLVL_NONE, 7, 0.0F);
 }
 
 TEST_F(Array, WithoutALevelLineHasNoRule) {
