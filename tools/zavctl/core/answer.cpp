@@ -51,10 +51,7 @@ std::string what_is_well(const Answer &answer) {
 }
 
 std::string what_is_wrong(const Answer &answer) {
-    std::vector<std::string> texts;
-    for (const Finding &finding : findings(answer))
-        texts.push_back(finding.text);
-    return joined(texts, "; ");
+    return joined(told_together(findings(answer)), "; ");
 }
 
 std::string section_text(const Section &section, const Style &style) {

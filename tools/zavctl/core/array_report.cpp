@@ -15,19 +15,28 @@ constexpr const char *level_words[] = {"unknown", "none",   "raid0",  "raid1",  
 
 std::string array_name(const ArrayReport &array) {
     if (array.kernel_name.empty())
-        return fmt::format("array {}", array.number);
-    return fmt::format("array {} ({})", array.number, array.kernel_name);
+        return fmt::format("{}", array.number);
+    return fmt::format("{} ({})", array.number, array.kernel_name);
 }
 
-std::string finding_text(const ArrayReport &array) {
-    const std::string state = array_state_word(array);
-    if (severity(array) == Severity::unknown)
-        return "the state of " + array_name(array) + " cannot be told";
-    if (state == "resync")
-        return fmt::format("{} is rebuilding, {:.0f} %", array_name(array), array.resync);
-    if (state == "failed")
-        return array_name(array) + " has failed";
-    return array_name(array) + (state == "degraded" ? " is degraded" : " does not exist");
+Finding finding(const ArrayReport &array) {
+    const Severity bad = severity(array);
+    const auto about = [&array, bad](const std::string &is, const std::string &are) {
+        return finding_about(bad, "array", array_name(array), is, are);
+    };
+    const std::string progress = fmt::format("rebuilding, {:.0f} %", array.resync);
+    if (bad == Severity::unknown)
+        return about("gives no answer to trust", "give no answer to trust");
+    switch (array.state) {
+    case ZAV_RAID_RESYNC:
+        return about("is " + progress, "are " + progress);
+    case ZAV_RAID_FAILED:
+        return about("has failed", "have failed");
+    case ZAV_RAID_DEGRADED:
+        return about("is degraded", "are degraded");
+    default:
+        return about("does not exist", "do not exist");
+    }
 }
 
 // "disk3p2" of "/dev/sata/disk3p2".
@@ -35,16 +44,20 @@ std::string short_name(const Address &address) {
     return address.path.substr(address.path.rfind('/') + 1);
 }
 
-std::string member_text(const Address &member, const std::vector<DiskReport> &disks) {
+// The partition, and what keeps it from working: its disk, or that the array has put it out.
+std::string member_text(const Member &member, const std::vector<DiskReport> &disks) {
+    const std::string name = short_name(member.address);
     for (const DiskReport &disk : disks)
-        if (disk.slot == member.device.disk && disk.state != ZAV_HDD_FOUND)
-            return fmt::format("{}({})", short_name(member), disk_state_word(disk));
-    return short_name(member);
+        if (disk.slot == member.address.device.disk && disk.state != ZAV_HDD_FOUND)
+            return fmt::format("{}({})", name, disk_state_word(disk));
+    if (member.state == "active" || member.state == "unknown")
+        return name;
+    return fmt::format("{}({})", name, member.state == "no_partition" ? "none" : member.state);
 }
 
 std::string members_text(const ArrayReport &array, const std::vector<DiskReport> &disks) {
     std::vector<std::string> names;
-    for (const Address &member : array.members)
+    for (const Member &member : array.members)
         names.push_back(member_text(member, disks));
     return names.empty() ? "-" : fmt::format("{}", fmt::join(names, " "));
 }
@@ -71,7 +84,7 @@ Section common_section(const std::vector<ArrayReport> &arrays) {
     for (const ArrayReport &array : arrays) {
         section.records.push_back(array_json(array));
         if (severity(array) != Severity::ok)
-            section.findings.push_back({severity(array), finding_text(array)});
+            section.findings.push_back(finding(array));
     }
     const auto normal = std::count_if(arrays.begin(), arrays.end(), [](const ArrayReport &array) {
         return severity(array) == Severity::ok && array.state != ZAV_RAID_NOT_EXIST;
@@ -94,8 +107,7 @@ Details array_details(const ArrayReport &array) {
         details.add("Note", array_note(array));
     if (!array.doubt.empty())
         details.add("Doubt", array.doubt, Severity::unknown);
-    if (!array.kernel_says.empty())
-        details.add("Kernel", printable(array.kernel_says));
+    details.add_lines("Kernel", array.kernel_says);
     return details;
 }
 
@@ -189,8 +201,8 @@ Json array_json(const ArrayReport &array) {
     json["level_code"] = array.level;
     json["rebuild_percent"] = percent ? Json(*percent) : Json(nullptr);
     json["members"] = Json::array();
-    for (const Address &member : array.members)
-        json["members"].push_back(to_json(member));
+    for (const Member &member : array.members)
+        json["members"].push_back({{"address", to_json(member.address)}, {"state", member.state}});
     json["expected"] = array.expected;
     json["severity"] = word(severity(array));
     json["note"] = array_note(array);
@@ -202,13 +214,14 @@ Json array_json(const ArrayReport &array) {
 Section array_list_section(const std::vector<ArrayReport> &arrays,
                            const std::vector<DiskReport> &disks) {
     Section section = common_section(arrays);
-    section.table = Table({"ARRAY", "LEVEL", "STATE", "MEMBERS", "NOTE"}, 2);
+    section.table = Table({"ARRAY", "LEVEL", "STATE", "MEMBERS"}, 2);
     for (const ArrayReport &array : arrays) {
         const std::string note = array_note(array);
         section.table.add(severity(array),
-                          {fmt::format("{} {}", array.number, array.kernel_name),
-                           shown_level(array.level), shown_state(array), members_text(array, disks),
-                           note.empty() ? rebuild_text(array) : note});
+                          {trimmed(fmt::format("{} {}", array.number, array.kernel_name)),
+                           shown_level(array.level), shown_state(array),
+                           members_text(array, disks)},
+                          note.empty() ? rebuild_text(array) : note);
     }
     return section;
 }

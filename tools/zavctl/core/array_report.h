@@ -10,6 +10,12 @@
 
 namespace zavctl {
 
+struct Member {
+    Address address;
+    // As the kernel lists it, see member_state(), or "no_partition".
+    std::string state = "unknown";
+};
+
 struct ArrayReport {
     int number = 0;
     Address address;
@@ -18,7 +24,7 @@ struct ArrayReport {
     int level = 0;           // ZAV_RAIDLVL_*, 0 if not told
     double resync = 0;       // as the library gives it
     bool expected = false;   // some disk has a partition for it, or its node exists
-    std::vector<Address> members;
+    std::vector<Member> members;
     std::string doubt;       // why the answer cannot be trusted, "" if it can
     std::string kernel_says; // the array's lines in /proc/mdstat, "" if there are none
     std::string refusal;     // what in those lines the library does not take, "" if nothing

@@ -10,11 +10,15 @@ namespace zavctl {
 
 namespace {
 
-std::string finding_text(const DiskReport &disk) {
-    if (severity(disk) == Severity::unknown)
-        return fmt::format("the state of disk {} cannot be told", disk.slot);
-    return fmt::format("disk {} {}", disk.slot,
-                       disk.state == ZAV_HDD_FAILED ? "has failed" : "is absent");
+Finding finding(const DiskReport &disk) {
+    const Severity bad = severity(disk);
+    const std::string name = fmt::format("{}", disk.slot);
+    if (bad == Severity::unknown)
+        return finding_about(bad, "disk", name, "gives no answer to trust",
+                             "give no answer to trust");
+    if (disk.state == ZAV_HDD_FAILED)
+        return finding_about(bad, "disk", name, "has failed", "have failed");
+    return finding_about(bad, "disk", name, "is absent", "are absent");
 }
 
 // Doubts that several disks share are said once.
@@ -35,7 +39,7 @@ Section common_section(const std::vector<DiskReport> &disks) {
     for (const DiskReport &disk : disks) {
         section.records.push_back(disk_json(disk));
         if (severity(disk) != Severity::ok)
-            section.findings.push_back({severity(disk), finding_text(disk)});
+            section.findings.push_back(finding(disk));
         found += disk.state == ZAV_HDD_FOUND ? 1U : 0U;
     }
     section.well = fmt::format("{} {} found", found, found == 1 ? "disk" : "disks");

@@ -299,7 +299,7 @@ Section doctor_section(const Checks &checks) {
     section.table = Table({"CHECK", "STATE", "FOUND"}, 1);
     for (const Check &check : checks) {
         const std::string text =
-            check.means.empty() ? check.found : check.found + ". " + check.means;
+            check.means.empty() ? check.found : check.found + ": " + check.means;
         section.table.add(check.severity, {check.name, word(check.severity), text});
         section.records.push_back(
             {{"kind", "check"},

@@ -109,6 +109,19 @@ std::string mdstat_refusal(std::string_view mdstat, std::string_view kernel_name
     return block.empty() || !mixup.empty() ? mixup : third_line_refusal(block);
 }
 
+std::string member_state(std::string_view block, std::string_view node) {
+    if (block.empty() || node.empty())
+        return "unknown";
+    const std::string_view line = take_line(block);
+    const std::size_t at = line.find(fmt::format(" {}[", node));
+    if (at == std::string_view::npos)
+        return "out";
+    const std::string_view entry = line.substr(at + 1, line.find_first_of(" \n", at + 1) - at - 1);
+    if (holds(entry, "(F)"))
+        return "faulty";
+    return holds(entry, "(S)") ? "spare" : "active";
+}
+
 std::vector<MdstatProblem> mdstat_problems(std::string_view mdstat) {
     std::vector<MdstatProblem> problems;
     for (const char *name : {"md0", "md1", "md2", "md3"}) {

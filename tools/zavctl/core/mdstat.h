@@ -18,6 +18,10 @@ std::string mdstat_refusal(std::string_view mdstat, std::string_view kernel_name
 // The case of those where the library does answer, but for another array; "" if it does not.
 std::string mdstat_mixup(std::string_view mdstat, std::string_view kernel_name);
 
+// What the kernel says about a partition in the array's lines: "active", "faulty", "spare", "out"
+// (not listed), or "unknown" if there are no lines. `node` is the kernel's name of it: "sdc2".
+std::string member_state(std::string_view block, std::string_view node);
+
 struct MdstatProblem {
     std::string kernel_name;
     std::string reason;

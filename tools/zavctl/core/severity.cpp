@@ -1,5 +1,7 @@
 #include "severity.h"
 
+#include "text.h"
+
 #include <algorithm>
 
 namespace zavctl {
@@ -30,6 +32,31 @@ std::string word(Severity severity) {
         break;
     }
     return "unknown";
+}
+
+Finding finding_about(Severity severity, const std::string &noun, const std::string &name,
+                      const std::string &is, const std::string &are) {
+    return {severity, noun + " " + name + " " + is, noun, name, is, are};
+}
+
+std::vector<std::string> told_together(const std::vector<Finding> &findings) {
+    std::vector<std::string> sentences;
+    for (std::size_t i = 0; i < findings.size(); ++i) {
+        const Finding &first = findings[i];
+        std::vector<std::string> names;
+        bool told_before = false;
+        for (std::size_t j = 0; j < findings.size(); ++j)
+            if (!first.noun.empty() && findings[j].noun == first.noun &&
+                findings[j].is == first.is) {
+                names.push_back(findings[j].name);
+                told_before = told_before || j < i;
+            }
+        if (names.size() < 2)
+            sentences.push_back(first.text);
+        else if (!told_before)
+            sentences.push_back(first.noun + "s " + listed(names) + " " + first.are);
+    }
+    return sentences;
 }
 
 Severity worse(Severity a, Severity b) {

@@ -171,6 +171,9 @@ void Table::write_row(std::string &out, const Row &row, const std::vector<std::s
     strip_line_end(out);
     for (std::size_t i = 1; i < lines.size(); ++i)
         out += std::string(start, ' ') + lines[i] + "\n";
+    if (!row.below.empty())
+        for (const std::string &line : wrapped(row.below, room(style, start)))
+            out += std::string(start, ' ') + line + "\n";
 }
 
 // A last column in which no row has anything to say gets no heading.
@@ -191,6 +194,16 @@ std::string Table::text(const Style &style) const {
     for (const Row &row : rows_)
         write_row(out, row, widths, style);
     return out;
+}
+
+void Details::add_lines(const std::string &name, std::string_view lines) {
+    for (std::string shown = name; !lines.empty(); shown = "") {
+        const std::size_t end = std::min(lines.find('\n'), lines.size());
+        const std::string line = printable(lines.substr(0, end));
+        if (!trimmed(line).empty())
+            add(shown, line);
+        lines.remove_prefix(std::min(end + 1, lines.size()));
+    }
 }
 
 std::string Details::text(const Style &style) const {

@@ -43,20 +43,22 @@ std::vector<std::string> wrapped(std::string_view text, std::size_t width);
 std::string listed(const std::vector<std::string> &words);
 
 // A table: one heading per column, one mark per row, and a column whose text takes the colour of
-// its row's severity. The last column is wrapped at the end of the screen.
+// its row's severity. The last column, and what stands below it, is wrapped at the end of the
+// screen.
 class Table {
   public:
     struct Row {
         Severity severity = Severity::ok;
         std::vector<std::string> cells;
+        std::string below; // a line of its own under the last column, "" for none
     };
 
     Table() = default;
     Table(std::vector<std::string> headings, std::size_t state_column)
         : headings_(std::move(headings)), state_column_(state_column) {}
 
-    void add(Severity severity, std::vector<std::string> cells) {
-        rows_.push_back({severity, std::move(cells)});
+    void add(Severity severity, std::vector<std::string> cells, std::string below = "") {
+        rows_.push_back({severity, std::move(cells), std::move(below)});
     }
     bool empty() const { return headings_.empty(); }
     std::string text(const Style &style) const;
@@ -78,6 +80,8 @@ class Details {
     void add(std::string name, std::string value, Severity severity = Severity::ok) {
         lines_.push_back({std::move(name), std::move(value), severity});
     }
+    // Several lines below each other under one name.
+    void add_lines(const std::string &name, std::string_view lines);
     std::string text(const Style &style) const;
 
   private:

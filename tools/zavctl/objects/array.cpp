@@ -7,6 +7,7 @@
 #include <fmt/format.h>
 
 #include <algorithm>
+#include <filesystem>
 #include <unistd.h>
 
 namespace zavctl {
@@ -76,6 +77,14 @@ ArrayReport unanswered(const Machine &machine, int number, const Session &sessio
     return array;
 }
 
+// The kernel's name of a node that the appliance's rules have made a link to it: "sdc2". "" if
+// the node is none.
+std::string kernel_node(const Address &address) {
+    std::error_code error;
+    const auto target = std::filesystem::read_symlink(address.path, error);
+    return error ? "" : target.filename().string();
+}
+
 void add_kernel_lines(ArrayReport &array) {
     if (array.kernel_name.empty())
         return;
@@ -83,6 +92,10 @@ void add_kernel_lines(ArrayReport &array) {
     array.kernel_says = mdstat_block(mdstat.text, array.kernel_name);
     array.refusal = array.failure ? mdstat_refusal(mdstat.text, array.kernel_name) : "";
     array.doubt = mdstat_mixup(mdstat.text, array.kernel_name);
+    for (Member &member : array.members)
+        member.state = exists(member.address)
+                           ? member_state(array.kernel_says, kernel_node(member.address))
+                           : "no_partition";
 }
 
 ArrayReport answered(ArrayReport array, const std::string &tool_missing) {
@@ -94,7 +107,7 @@ ArrayReport answered(ArrayReport array, const std::string &tool_missing) {
     const int count = std::clamp(answer.state.raidcount, 0, 4);
     for (int i = 0; i < count; ++i)
         if (answer.state.hdddev[i].type != 0)
-            array.members.push_back(library::address_of(answer.state.hdddev[i]));
+            array.members.push_back({library::address_of(answer.state.hdddev[i]), "unknown"});
     add_kernel_lines(array);
     if (array.failure && !tool_missing.empty())
         array.refusal = tool_missing;
