@@ -148,6 +148,7 @@ Words bubblewrap_arguments(const Options &options, const fs::path &self) {
 
 std::vector<char *> exec_vector(Words &words) {
     std::vector<char *> pointers;
+    pointers.reserve(words.size() + 1);
     for (std::string &word : words)
         pointers.push_back(word.data());
     pointers.push_back(nullptr);

@@ -5,8 +5,8 @@
 #include "model/sentences.hpp"
 
 #include <algorithm>
-#include <cstdio>
 #include <fmt/format.h>
+#include <sstream>
 
 namespace zavsim {
 
@@ -158,24 +158,24 @@ std::string perform(State &state, const Action &action) {
 
 std::string perform_sentence(State &state, const std::string &sentence) {
     const Sentence parsed = parse_sentence(sentence);
-    const std::string problem = parsed.error.empty() ? perform(state, parsed.action) : parsed.error;
+    std::string problem = parsed.error.empty() ? perform(state, parsed.action) : parsed.error;
     state.notes.push_back(problem.empty() ? sentence : sentence + ": " + problem);
     return problem;
 }
 
 void scsi_command(State &state, const std::string &line) {
-    char verb[32] = {};
+    std::istringstream in(line);
+    std::string name;
+    std::string verb;
     int host = -1;
-    int zero[3] = {};
-    if (sscanf(line.c_str(), "scsi %31s %d %d %d %d", verb, &host, &zero[0], &zero[1], &zero[2]) !=
-        5)
+    if (!(in >> name >> verb >> host) || name != "scsi")
         return;
     for (Disk &disk : state.disks) {
         if (disk.host != host || !disk.inserted)
             continue;
-        if (std::string(verb) == "add-single-device" && !disk.attached) {
+        if (verb == "add-single-device" && !disk.attached) {
             attach(state, disk);
-        } else if (std::string(verb) == "remove-single-device" && disk.attached) {
+        } else if (verb == "remove-single-device" && disk.attached) {
             detach(state, disk);
             fail_members(state, disk);
         }

@@ -94,6 +94,7 @@ Disk new_disk(State &state, int slot) {
 
 std::vector<std::string> model_names() {
     std::vector<std::string> names;
+    names.reserve(identities.size());
     for (const auto &[name, identity] : identities)
         names.push_back(name);
     return names;
@@ -101,6 +102,7 @@ std::vector<std::string> model_names() {
 
 std::vector<std::string> level_names() {
     std::vector<std::string> names;
+    names.reserve(levels.size());
     for (const Level &level : levels)
         names.emplace_back(level.name);
     return names;

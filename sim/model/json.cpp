@@ -18,6 +18,7 @@ struct adl_serializer<std::optional<Value>> {
 
 namespace zavsim {
 
+// cppcheck-suppress unknownMacro
 NLOHMANN_JSON_SERIALIZE_ENUM(Role, {{Role::in_sync, "in sync"},
                                     {Role::rebuilding, "rebuilding"},
                                     {Role::spare, "spare"},

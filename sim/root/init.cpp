@@ -56,6 +56,7 @@ void restore_signals() {
     set_environment(options);
     std::vector<std::string> words = options.command;
     std::vector<char *> pointers;
+    pointers.reserve(words.size() + 1);
     for (std::string &word : words)
         pointers.push_back(word.data());
     pointers.push_back(nullptr);

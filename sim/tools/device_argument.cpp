@@ -2,17 +2,16 @@
 
 #include "root/files.hpp"
 
-#include <cstdio>
+#include <charconv>
 #include <filesystem>
 #include <fmt/format.h>
+#include <sstream>
 
 namespace fs = std::filesystem;
 
 namespace zavsim {
 
 namespace {
-
-constexpr const char *node_format = "simulated node %c %d %d";
 
 std::string letter_of_minor(int minor) {
     const int index = minor / 16;
@@ -24,10 +23,13 @@ std::string letter_of_minor(int minor) {
 std::optional<DevicePlace> made_node(const fs::path &path) {
     if (fs::file_size(path) > 64)
         return std::nullopt;
+    std::istringstream in(read_text(path).value_or(""));
+    std::string simulated;
+    std::string node;
     char kind = 0;
     int major = 0;
     int minor = 0;
-    if (sscanf(read_text(path)->c_str(), node_format, &kind, &major, &minor) != 3)
+    if (!(in >> simulated >> node >> kind >> major >> minor) || simulated + node != "simulatednode")
         return std::nullopt;
     if (kind != 'b' || major != 8 || minor < 0)
         return std::nullopt;
@@ -50,10 +52,12 @@ std::optional<DevicePlace> device_behind(const std::string &path) {
 std::optional<int> array_behind(const std::string &path) {
     std::error_code error;
     const std::string node = fs::canonical(path, error);
+    const std::string beginning = "/dev/md";
     int minor = 0;
-    int end = 0;
-    if (error || sscanf(node.c_str(), "/dev/md%d%n", &minor, &end) != 1 ||
-        static_cast<std::size_t>(end) != node.size())
+    if (error || node.rfind(beginning, 0) != 0 || node.size() == beginning.size())
+        return std::nullopt;
+    const char *end = node.data() + node.size();
+    if (std::from_chars(node.data() + beginning.size(), end, minor).ptr != end)
         return std::nullopt;
     return minor;
 }
