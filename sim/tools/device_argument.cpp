@@ -44,7 +44,7 @@ std::optional<DevicePlace> device_behind(const std::string &path) {
     if (error || !fs::is_regular_file(node))
         return std::nullopt;
     if (node.parent_path() == "/dev")
-        if (const auto place = parse_kernel_name(node.filename()))
+        if (auto place = parse_kernel_name(node.filename()))
             return place;
     return made_node(node);
 }
