@@ -266,7 +266,7 @@ std::string shell_doubt(const RunResult &shell_false) {
     if (shell_false.end != RunResult::End::exited)
         return "/bin/sh does not run: no tool can be asked";
     if (shell_false.status == 0)
-        return "/bin/sh is not bash: it reports success for a command whose output is thrown away, "
+        return "it is not bash and reports success for a command whose output is thrown away, "
                "so that every disk reads as found";
     if (shell_false.status != 1)
         return fmt::format("/bin/sh gives exit status {} for a command that gives 1: the states of "
@@ -308,7 +308,7 @@ Section doctor_section(const Checks &checks) {
              {"found", check.found},
              {"means", check.means.empty() ? Json(nullptr) : Json(check.means)}});
         if (check.severity != Severity::ok)
-            section.findings.push_back({check.severity, check.name});
+            section.findings.push_back({check.severity, check.name + ": " + check.found});
     }
     section.well = fmt::format("{} checks passed", checks.size());
     return section;

@@ -19,7 +19,7 @@ constexpr CodeMeaning meanings[] = {
     {ZAV_RC_ERR_EACCES, "the device is in use by another program"},
     {ZAV_RC_ERR_EBUSY, "the device is busy"},
     {ZAV_RC_ERR_ENODEV, "no such device"},
-    {ZAV_RC_ERR_EINVAL, "the library does not take this address here"},
+    {ZAV_RC_ERR_EINVAL, "the library refuses this address"},
     {ZAV_RC_ERR, "a step failed"},
     {0x1001, "the saved file came out too short"},
     {0x1301, "no known model"},
