@@ -1,0 +1,83 @@
+#include "queries.h"
+
+#include "zav_api.h"
+
+#include <cstdio>
+#include <cstdlib>
+
+namespace bench {
+
+namespace {
+
+// A wrong answer is often a quick one: it must not be measured.
+void require(bool right, const char *what) {
+    if (right)
+        return;
+    fprintf(stderr, "zav_bench: %s did not give the expected answer\n", what);
+    exit(1);
+}
+
+// ---- The bare commands, as a program without the library would run them. ----
+
+void run(const char *command) {
+    require(system(command) == 0, command);
+}
+
+void read_all(const char *command) {
+    FILE *output = popen(command, "r");
+    require(output != nullptr, command);
+    char text[4096];
+    size_t length = 0;
+    for (size_t got = 0; (got = fread(text, 1, sizeof text, output)) > 0;)
+        length += got;
+    require(pclose(output) == 0 && length > 0, command);
+}
+
+// ---- The library's calls. ----
+
+void ask_disk() {
+    zavDevice disk = {ZAV_DEV_HDD, ZAV_MINDEV_HDD_SATA, 1, 0};
+    zavHddState info;
+    require(zavGetStateDisk(&disk, &info) == ZAV_RC_OK && info.state == ZAV_HDD_FOUND,
+            "zavGetStateDisk");
+}
+
+void ask_array() {
+    zavDevice array = {ZAV_DEV_RAID, ZAV_MINDEV_RAID_SW, 2, 1};
+    zavRaidState info;
+    require(zavGetStateRaid(&array, &info) == ZAV_RC_OK && info.state == ZAV_RAID_NORMAL &&
+                info.raidlevel == ZAV_RAIDLVL_5,
+            "zavGetStateRaid");
+}
+
+void count_disks() {
+    int count = 0;
+    require(get_diskcount(&count) == ZAV_RC_OK && count == 1, "get_diskcount");
+}
+
+void synchronise() {
+    require(zavSyncConf() == ZAV_RC_OK, "zavSyncConf");
+}
+
+void map_time_zone() {
+    require(zavMapArcTimeZone() == 1, "zavMapArcTimeZone");
+}
+
+} // namespace
+
+const std::vector<Query> &queries() {
+    static const std::vector<Query> all = {
+        {"zavGetStateDisk, healthy disk", "smartctl -H -d ata /dev/sata/disk1 &>/dev/null", run,
+         ask_disk},
+        {"zavGetStateRaid, software array", "/sbin/mdadm --detail /dev/md1", read_all, ask_array},
+        {"get_diskcount", "cat /proc/scsi/scsi | grep \"Vendor: ATA\" | wc -l", read_all,
+         count_disks},
+        {"zavMapArcTimeZone",
+         R"(cat /etc/sysconfig/clock | grep "ZONE=" | cut -d "\"" -f 2 | cut -d "/" -f 2)",
+         read_all, map_time_zone},
+        {"zavSyncConf", "/usr/bin/syncConf.sh", run, synchronise},
+    };
+    return all;
+}
+
+} // namespace bench
