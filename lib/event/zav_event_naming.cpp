@@ -241,7 +241,7 @@ int zavDevToStr(char *label, size_t size, zavDevice *dev) {
         return ZAV_RC_ERR_EINVAL;
     if (strlen(name) > size - 1)
         return ZAV_RC_ERR_ENOMEM;
-    memcpy(label, name, strlen(name));
+    strcpy(label, name);
     return ZAV_RC_OK;
 }
 

@@ -125,7 +125,6 @@ int apply_rebuild_line(const char *line, zavRaidState *info) {
 // The two lines behind the array's own. Those that the file no longer has are empty.
 int read_array_block(const char *function, zav::File &mdstat, int active, zavRaidState *info) {
     info->state = ZAV_RAID_NORMAL;
-    info->resync = 0.0F;
 
     char line[kLine] = "";
     mdstat.line(line, sizeof line);
@@ -161,7 +160,6 @@ int read_mdstat(const char *function, const char *mdname, int active, zavRaidSta
     if (!found) {
         info->raidlevel = ZAV_RAIDLVL_NONE;
         info->state = ZAV_RAID_NOT_EXIST;
-        info->resync = 0.0F;
         ZAV_TRACE(zav::kTraceStep, "=====>zav_raid.c->%s(): ZAV_RAID_NOT_EXIST\n", function);
     }
     return ZAV_RC_OK;

@@ -199,6 +199,10 @@ TEST_F(Array, WhoseBlockEndsEarlyIsAnError) {
     mdadm("     Raid Level : raid5\n Active Devices : 3\n");
     EXPECT_EQ(ask(kArray2), ZAV_RC_ERR);
     expect(kArray2, ZAV_RAID_DEGRADED, ZAV_RAIDLVL_5, 4, 0.0F);
+    // The status line is not taken for the third.
+    put("/proc/mdstat", "md1 : active raid5\n" + std::string(kRebuild));
+    EXPECT_EQ(ask(kArray2), ZAV_RC_ERR);
+    expect(kArray2, ZAV_RAID_DEGRADED, ZAV_RAIDLVL_5, 4, 0.0F);
 }
 
 TEST_F(Array, MissingFromMdstatDoesNotExistButHasMembers) {
