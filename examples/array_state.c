@@ -28,7 +28,7 @@ int main(int argc, char **argv) {
     }
     const int rc = zavGetStateRaid(&array, &info);
     if (rc != ZAV_RC_OK) {
-        fprintf(stderr, "%s: no answer, %s\n", argv[1], zav_rcdef_to_str(rc, name));
+        fprintf(stderr, "%s: no answer, 0x%x %s\n", argv[1], rc, zav_rcdef_to_str(rc, name));
         return 2;
     }
     printf("%s: %s", argv[1], words(info.state));

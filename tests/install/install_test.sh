@@ -116,6 +116,9 @@ examples_see_a_lost_disk() {
     check "array_state tells an array that is not there" prints 1 \
         "/dev/swraid/disk4p1: does not exist" \
         --model 2860-4 --time-scale 100 -- "$programs/array_state" /dev/swraid/disk4p1
+    check "array_state tells why there is no answer" prints 2 \
+        "/dev/swraid/disk2p1: no answer, 0x80 ZAV_RC_ERR" \
+        --model 2860-4 -- sh -c "zavsim act array 2 checks && '$programs/array_state' /dev/swraid/disk2p1"
     check "array_state refuses what is no address" prints 2 \
         "usage: array_state /dev/swraid/diskNp1" -- "$programs/array_state" nonsense
     check "disk_check tells that it is on no appliance" prints 3 \
