@@ -162,7 +162,7 @@ bool sas_characters(const char *rest) {
 
 bool parse_sas(const char *rest, zavDevice &dev) {
     const char *disk = strstr(rest, "disk");
-    if (*rest == '\0' || !sas_characters(rest) || disk == nullptr)
+    if (!sas_characters(rest) || disk == nullptr)
         return false;
     int unit = 0;
     if (!number_before(rest, disk, unit))
@@ -178,7 +178,7 @@ bool parse_sas(const char *rest, zavDevice &dev) {
 bool parse_data_volume(const char *rest, const char *volume, zavDevice &dev) {
     if (!number(volume + strlen(kVolume), dev.disk))
         return false;
-    if (volume == rest || volume[-1] != '/')
+    if (volume[-1] != '/')
         return false;
     return number_before(rest, volume - 1, dev.part) && dev.part >= 1;
 }

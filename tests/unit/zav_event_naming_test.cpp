@@ -1,6 +1,7 @@
 // Device addresses and the names of their device files.
 #include "harness.h"
 
+#include <cctype>
 #include <cstring>
 
 namespace {
@@ -34,11 +35,14 @@ const Pair kPairs[] = {
     {{ZAV_DEV_RAID, ZAV_MINDEV_RAID_SW, 2147483647, 2147483647},
      "/dev/swraid/disk2147483647p2147483647"},
     {{ZAV_DEV_LVM, ZAV_MINDEV_LVM_VG, 0, 0}, "/dev/PrimaryOSVG"},
+    {{ZAV_DEV_LVM, ZAV_MINDEV_LVM_VG, 1, 0}, "/dev/DataVG1"},
     {{ZAV_DEV_LVM, ZAV_MINDEV_LVM_VG, 2, 0}, "/dev/DataVG2"},
     {{ZAV_DEV_LVM, ZAV_MINDEV_LVM_LV, 1, 0}, "/dev/PrimaryOSVG/LogVol1"},
+    {{ZAV_DEV_LVM, ZAV_MINDEV_LVM_LV, 1, 1}, "/dev/DataVG1/LogVol1"},
     {{ZAV_DEV_LVM, ZAV_MINDEV_LVM_LV, 3, 2}, "/dev/DataVG2/LogVol3"},
     {{ZAV_DEV_NIC, ZAV_MINDEV_NIC_ETH, 1, 0}, "eth0"},
     {{ZAV_DEV_NIC, ZAV_MINDEV_NIC_ETH, 12, 0}, "eth11"},
+    {{ZAV_DEV_NIC, ZAV_MINDEV_NIC_ETH, 123456790, 0}, "eth123456789"},
     {{ZAV_DEV_NIC, ZAV_MINDEV_NIC_BOND, 1, 0}, "bond0"},
 };
 
@@ -253,6 +257,16 @@ TEST(Addresses, OfSasDisksNeedUnitAndDisk) {
 TEST(Addresses, OfSasDisksDropTheHighBitsOfTheNumber) {
     expect_address("/dev/sas/r1disk258", {ZAV_DEV_HDD, ZAV_MINDEV_HDD_SAS, 256 + 2, 0});
     expect_address("/dev/sasraid/r256disk1", {ZAV_DEV_RAID, ZAV_MINDEV_RAID_SAS, 65536 + 1, 0});
+}
+
+TEST(Addresses, TakeEveryLetterAndDigitAsACharacter) {
+    for (char c = 1; c > 0; ++c) {
+        const bool accepted = isalnum(c) != 0 ? c != 'p' : c == '/';
+        const Parsed parsed = parse(std::string("/dev/sas/r1disk") + c);
+        EXPECT_EQ(parsed.rc, accepted ? ZAV_RC_OK : ZAV_RC_ERR_EINVAL) << c;
+        if (c == 127)
+            break;
+    }
 }
 
 TEST(Addresses, OfSasDisksLetTheCharacterBehindDiskEscapeTheCheck) {

@@ -68,6 +68,20 @@ TEST_F(Model, CountsDisksInTheThirdField) {
     }
 }
 
+TEST_F(Model, CountsTheFirst31CharactersOfTheLine) {
+    model("SV-2860\n", "t;" + std::string(27, '0') + ";40\n"); // the 4 is the last that counts
+    EXPECT_EQ(zavGetModel(), 0x204);
+    model("SV-2860\n", "t;" + std::string(26, '0') + ";40\n");
+    EXPECT_EQ(zavGetModel(), 0);
+}
+
+TEST_F(Model, CountsTheFirst19CharactersOfTheProduct) {
+    model(std::string(15, 'x') + "2860\n", "t;0;4\n");
+    EXPECT_EQ(zavGetModel(), 0x204);
+    model(std::string(16, 'x') + "2860\n", "t;0;4\n");
+    EXPECT_EQ(zavGetModel(), 0);
+}
+
 TEST_F(Model, IsUnknownWithoutBios) {
     EXPECT_EQ(zavGetModel(), 0);
     EXPECT_EQ(record().log,
