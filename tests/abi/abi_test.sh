@@ -5,9 +5,16 @@ set -u
 source=$1 build=$2
 shift 2
 flags=("$@")
-scratch=$(mktemp -d)
+scratch=$(mktemp -d "$PWD/abi.XXXXXX") # the private root shows the current directory
 trap 'rm -rf "$scratch"' EXIT
 . "$source/tests/check.sh"
+
+# build_program NAME SOURCE-FILE: with the library beside it.
+build_program() {
+    cp -P "$build"/libzav.so* "$scratch" &&
+        gcc "${flags[@]}" -std=c99 -I "$source/include" "$2" -L "$scratch" -lzav \
+            -Wl,-rpath,"$scratch" -o "$scratch/$1"
+}
 
 exported() {
     nm -D --defined-only "$build/libzav.so" | awk '{print $2, $3}' | LC_ALL=C sort |
@@ -52,9 +59,18 @@ layouts_are_one() {
 }
 
 own_names() {
-    gcc "${flags[@]}" -std=c99 -I "$source/include" "$source/tests/abi/own_names.c" \
-        -L "$build" -lzav -Wl,-rpath,"$build" -o "$scratch/own_names" &&
+    build_program own_names "$source/tests/abi/own_names.c" &&
         "$ZAV_SIM" --bare -- "$scratch/own_names"
+}
+
+# The example program of this width, on a simulated appliance whose disk 3 has failed.
+answers_on_an_appliance() {
+    build_program array_state "$source/examples/array_state.c" || return 1
+    "$ZAV_SIM" -- bash -c "zavsim act disk 3 fails
+        $scratch/array_state /dev/swraid/disk2p1" >"$scratch/answer.txt"
+    [ $? -eq 1 ] && diff - "$scratch/answer.txt" <<'EOF'
+/dev/swraid/disk2p1: degraded, a disk is missing, RAID 5 of 4 disks
+EOF
 }
 
 check "the exported names are those of the list" exported
@@ -67,5 +83,6 @@ for name in zav zav_event zav_led zav_rbod zav_hwraid zav_api zav_private; do
     check "$name.h is C++20" header c++ c++20 "$name.h"
 done
 check "records have one layout on 32 and 64 bits" layouts_are_one
+check "the library answers on a simulated appliance" answers_on_an_appliance
 check "a caller's function with a library's name is no replacement" own_names
 finish
