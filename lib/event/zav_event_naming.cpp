@@ -65,7 +65,7 @@ bool compose_volume(char *name, const zavDevice &dev) {
     if (!volume && dev.minor_type != ZAV_MINDEV_LVM_VG)
         return false; // physical volumes have no name of their own
     const int group = volume ? dev.part : dev.disk;
-    char path[kLongestName] = "/dev/PrimaryOSVG";
+    char path[32] = "/dev/PrimaryOSVG";
     if (group > 0)
         snprintf(path, sizeof path, "/dev/DataVG%d", group);
     if (volume)
