@@ -4,6 +4,7 @@
 #include "model/sentences.hpp"
 
 #include <CLI/CLI.hpp>
+#include <cstdint>
 #include <fmt/format.h>
 #include <fstream>
 #include <iterator>
@@ -85,6 +86,20 @@ void check_level(const Options &options) {
 }
 
 } // namespace
+
+std::string to_word(const Options &options) {
+    std::string word;
+    for (const std::uint8_t byte : nlohmann::json::to_msgpack(options))
+        word += fmt::format("{:02x}", byte);
+    return word;
+}
+
+Options options_of(const std::string &word) {
+    std::vector<std::uint8_t> bytes;
+    for (std::size_t i = 0; i + 1 < word.size(); i += 2)
+        bytes.push_back(static_cast<std::uint8_t>(std::stoi(word.substr(i, 2), nullptr, 16)));
+    return nlohmann::json::from_msgpack(bytes).get<Options>();
+}
 
 Options parse_command_line(int argc, char **argv) {
     Options options;

@@ -34,6 +34,10 @@ NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(Options, model, product, serial, raidtype, le
                                    scenario, scenario_file, time_scale, bare, has_shim, directory,
                                    program_directory, command)
 
+// The options as one word of a command line, and back. Their texts are bytes, not characters.
+std::string to_word(const Options &options);
+Options options_of(const std::string &word);
+
 // Reads the command line; on wrong usage or --help prints and ends the process.
 Options parse_command_line(int argc, char **argv);
 

@@ -221,7 +221,7 @@ int run_in_private_root(Options options) {
     Channel channel;
     Words args = bubblewrap_arguments(options, self);
     add(args, {place::program, inside_word, std::to_string(channel.real_stderr),
-               std::to_string(channel.started[1]), nlohmann::json(options).dump()});
+               std::to_string(channel.started[1]), to_word(options)});
 
     const pid_t child = fork();
     if (child < 0)

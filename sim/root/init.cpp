@@ -95,9 +95,9 @@ void block_child_signal() {
 } // namespace
 
 int run_inside(const std::string &real_stderr, const std::string &started,
-               const std::string &options_text) {
+               const std::string &options_word) {
     report_started(std::stoi(real_stderr), std::stoi(started));
-    const Options options = nlohmann::json::parse(options_text).get<Options>();
+    const Options options = options_of(options_word);
     block_child_signal();
     populate_root(options);
     ProcessLinks links;

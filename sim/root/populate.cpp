@@ -99,6 +99,15 @@ void populate_root(const Options &options) {
     make_directories();
 }
 
+// 114 bytes, as the kernel's nvram driver presents the CMOS memory. What they mean is the BIOS's
+// business; zeros would look like a device that cannot be read.
+std::string bios_settings() {
+    std::string settings;
+    for (int i = 0; i < 114; ++i)
+        settings += static_cast<char>(1 + i * 37 % 251);
+    return settings;
+}
+
 void populate_appliance(const Options &options) {
     const Identity identity = identity_of(options.model);
     const auto chosen = [](const std::string &wish, const std::string &usual) {
@@ -116,8 +125,7 @@ void populate_appliance(const Options &options) {
     write_text("/etc/sysconfig/clock", "ZONE=\"Asia/Tokyo\"\nUTC=true\n");
     write_text("/etc/mtab", "");
     write_text("/etc/fstab", "");
-    // 114 bytes, as the kernel's nvram driver presents the CMOS memory.
-    make_sparse("/dev/nvram", 114);
+    write_text("/dev/nvram", bios_settings());
     for (const char *queue : {"/dev/zavevent0", "/dev/zavledevent"})
         make_sparse(queue, 0);
     fs::create_directories(place::run + "/queues");

@@ -40,6 +40,13 @@ TEST(Launcher, AnswersWrongUsageWith64) {
     EXPECT_EQ(zavsim({"--scenario", "/no/such/file", "--", "true"}).status, 64);
 }
 
+TEST(Launcher, PassesTextsOnAsTheirBytes) {
+    const std::string odd = "\xff 2860 'quoted' \x80";
+    EXPECT_EQ(on_appliance("cat /sys/class/dmi/id/product_name", {"--product", odd}).out,
+              odd + "\n");
+    EXPECT_EQ(zavsim({"--", "printf", "%s", odd}).out, odd);
+}
+
 TEST(Launcher, HelpsWithEverything) {
     const Outcome run = zavsim({"--help"});
     EXPECT_EQ(run.status, 0);

@@ -283,14 +283,15 @@ class PhysicalMemory : public harness::Appliance {
     static constexpr size_t kTable = 0x1234;
 
     static std::string memory(size_t at, const std::string &anchor = "_SM_",
-                              const std::string &second = "_DMI_") {
+                              const std::string &second = "_DMI_",
+                              const std::string &content = table()) {
         std::string bytes(0x100000, '\0');
-        const std::string content = table();
-        bytes.replace(kTable, content.size(), content);
-        bytes.replace(0xF0000 + at, anchor.size(), anchor);
+        const std::string behind = structure(2, std::string("\1\1\1\1", 4), {"no part of it"});
+        bytes.replace(kTable, content.size() + behind.size(), content + behind);
+        bytes.replace(0xF0000 + at, anchor.size() + 1, anchor + '\x77'); // a checksum follows
         const size_t half = 0xF0000 + at + 16;
         if (half + 16 <= bytes.size()) {
-            bytes.replace(half, second.size(), second);
+            bytes.replace(half, second.size() + 1, second + '\x5A');
             bytes[half + 6] = static_cast<char>(content.size());
             bytes[half + 7] = static_cast<char>(content.size() >> 8);
             bytes[half + 8] = static_cast<char>(kTable & 0xFF);
@@ -318,13 +319,22 @@ TEST_F(PhysicalMemory, HoldsTheTable) {
 TEST_F(PhysicalMemory, WithoutAnEntryPointLeavesTheResult) {
     put("/dev/mem", memory(0));
     ASSERT_EQ(entry(1), "SV-2860");
+    testing::internal::CaptureStdout();
     for (const std::string &bytes :
          {memory(8), memory(0, "_XX_"), memory(0, "_SM_", "_DMX_"), memory(0xFFF0)}) {
         put("/dev/mem", bytes);
         EXPECT_EQ(entry(2), "SV-2860");
     }
+    EXPECT_EQ(testing::internal::GetCapturedStdout(), "");
     put("/dev/mem", memory(0));
     EXPECT_EQ(entry(7), "SV-2860");
+}
+
+TEST_F(PhysicalMemory, IsReadAsFarAsTheTableIsLong) {
+    put("/dev/mem", memory(0));
+    ASSERT_EQ(entry(1), "SV-2860");
+    put("/dev/mem", memory(0, "_SM_", "_DMI_", structure(0, "", {}) + structure(9, "", {"other"})));
+    EXPECT_EQ(entry(2), "SV-2860");
 }
 
 TEST_F(PhysicalMemory, TheParagraphBehindAnAnchorIsNoAnchor) {

@@ -132,6 +132,18 @@ TEST(RunDisk, AToolThatHangsIsLeftAfterTheTimeLimit) {
     EXPECT_TRUE(run.out.ends_with("\n0\n")) << run.out; // and no tool is left behind
 }
 
+TEST(RunDisk, AnInterruptEndsItWithItsToolsAndNoAnswer) {
+    for (const auto &[name, status] : {std::pair("INT", 130), std::pair("TERM", 143)}) {
+        const Outcome run = on_zav("zavsim act tool smartctl hangs 100000s; "
+                                   "timeout --preserve-status -s " +
+                                   std::string(name) +
+                                   " 2 zavctl disk list; status=$?; sleep 20; "
+                                   "ps ax | grep -c '[s]martctl -H'; exit $status");
+        EXPECT_EQ(run.status, status);
+        EXPECT_EQ(run.out, "0\n");
+    }
+}
+
 TEST(RunArray, ADegradedArrayIsAWarning) {
     const Outcome run = on_zav("zavsim act disk 3 vanishes; zavctl array show 2");
     EXPECT_EQ(run.status, 1);

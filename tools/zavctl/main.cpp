@@ -1,6 +1,7 @@
 // zavctl: the state of a storage appliance at the command line.
 
 #include "command_line.h"
+#include "system/interrupt.h"
 
 #include <fmt/format.h>
 
@@ -67,6 +68,7 @@ int guarded_run(const Streams &streams, Session &session, const std::vector<std:
 } // namespace zavctl
 
 int main(int argc, char **argv) {
+    zavctl::end_on_interrupt();
     const zavctl::Streams streams;
     zavctl::Session session(streams);
     const int status = zavctl::guarded_run(

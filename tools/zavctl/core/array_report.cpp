@@ -46,7 +46,7 @@ std::string short_name(const Address &address) {
 
 // The partition, and what keeps it from working: its disk, or that the array has put it out.
 std::string member_text(const Member &member, const std::vector<DiskReport> &disks) {
-    const std::string name = short_name(member.address);
+    std::string name = short_name(member.address);
     for (const DiskReport &disk : disks)
         if (disk.slot == member.address.device.disk && disk.state != ZAV_HDD_FOUND)
             return fmt::format("{}({})", name, disk_state_word(disk));

@@ -46,6 +46,7 @@ NameReport converted(const zavDevice &device) {
 
 Answer name_answer(const std::vector<NameQuery> &queries) {
     std::vector<NameReport> reports;
+    reports.reserve(queries.size());
     for (const NameQuery &query : queries)
         reports.push_back(std::visit([](const auto &value) { return converted(value); }, query));
     return {"name", "", {name_section(reports)}};

@@ -80,7 +80,7 @@ void read_hosts(PlatformFacts &facts) {
     for (const std::string &name : names)
         if (digits_after(name, "ata"))
             for (const std::string &host : hosts_in(fmt::format("{}/{}", controller, name)))
-                facts.nested_hosts.push_back(name + "/" + host);
+                facts.nested_hosts.push_back(fmt::format("{}/{}", name, host));
 }
 
 void read_nvram(PlatformFacts &facts) {
@@ -132,7 +132,7 @@ bool is_socket(const char *path) {
 // The first partition of a disk: "/dev/sata/disk1p1".
 std::string first_partition(const std::vector<std::string> &nodes) {
     for (const std::string &node : nodes)
-        if (const std::string path = "/dev/sata/" + node;
+        if (std::string path = "/dev/sata/" + node;
             library::device_of(path).device.part > 0 && library::device_of(path).result == 0)
             return path;
     return "";

@@ -16,8 +16,6 @@
 #include <sstream>
 #include <unistd.h>
 
-extern char **environ;
-
 namespace zavctl {
 
 namespace {
@@ -99,6 +97,7 @@ RunResult collect(pid_t child, int descriptor, std::chrono::milliseconds limit) 
 
 std::vector<char *> arguments(std::vector<std::string> &command) {
     std::vector<char *> pointers;
+    pointers.reserve(command.size() + 1);
     for (std::string &word : command)
         pointers.push_back(word.data());
     pointers.push_back(nullptr);
@@ -153,7 +152,7 @@ std::string find_tool(const std::string &name) {
     const char *path = std::getenv("PATH");
     std::istringstream directories(path == nullptr ? "/usr/bin:/bin" : path);
     for (std::string directory; std::getline(directories, directory, ':');) {
-        const std::string file = (directory.empty() ? "." : directory) + "/" + name;
+        std::string file = (directory.empty() ? "." : directory) + "/" + name;
         if (executable(file))
             return file;
     }
