@@ -88,14 +88,6 @@ TEST(Launcher, TheShellCanBeDashToShowWhatComesOfIt) {
     EXPECT_NE(dash.find("0\n"), std::string::npos) << dash;
 }
 
-TEST(Launcher, StartsInThreeTenthsOfASecond) {
-    const auto start = std::chrono::steady_clock::now();
-    ASSERT_EQ(on_appliance("true").status, 0);
-    const std::chrono::duration<double> taken = std::chrono::steady_clock::now() - start;
-    // A sanitized build on a loaded machine gets more.
-    EXPECT_LT(taken.count(), 1.5);
-}
-
 TEST(Launcher, SaysInOneLineThatTheMachineCannotDoIt) {
     const Outcome run = execute({"env", "PATH=/nonexistent", ZAVSIM, "--", "true"});
     EXPECT_EQ(run.status, 71);

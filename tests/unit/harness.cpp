@@ -205,6 +205,7 @@ int semget(key_t key, int semaphores, int flags) {
 }
 
 void openlog(const char *ident, int options, int facility) {
+    harness::record().log_is_open = true;
     harness::log_ident = ident;
     harness::log_options = options;
     harness::log_facility = facility;
@@ -221,6 +222,7 @@ void syslog(int priority, const char *format, ...) {
 }
 
 void closelog(void) {
+    harness::record().log_is_open = false;
     harness::log_ident = "(the log is closed)";
 }
 }

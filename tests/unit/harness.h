@@ -31,6 +31,7 @@ std::ostream &operator<<(std::ostream &out, const LogRow &row);
 struct Record {
     std::vector<std::string> commands; // run by system or popen, in order
     std::vector<LogRow> log;
+    bool log_is_open = false;
     std::vector<unsigned> sleeps;             // seconds
     std::vector<unsigned> short_sleeps;       // microseconds
     std::function<void(size_t)> during_sleep; // told how many sleeps there were, this one included

@@ -223,18 +223,19 @@ Text printed(Function function) {
     return testing::internal::GetCapturedStdout();
 }
 
-// The pause reads standard input: here one line is waiting.
+// The pause reads one character from standard input: here a line and one more are waiting.
 template <typename Function>
 Text printed_with_input(Function function) {
     int ends[2];
     EXPECT_EQ(pipe(ends), 0);
-    EXPECT_EQ(write(ends[1], "\n", 1), 1);
+    EXPECT_EQ(write(ends[1], "\nX", 2), 2);
     close(ends[1]);
     const int saved = dup(STDIN_FILENO);
     dup2(ends[0], STDIN_FILENO);
     close(ends[0]);
     clearerr(stdin);
     Text text = printed(function);
+    EXPECT_EQ(getchar(), 'X');
     dup2(saved, STDIN_FILENO);
     close(saved);
     return text;

@@ -16,6 +16,7 @@ TEST_F(Log, NamesTheReporterAndTheNumber) {
     EXPECT_EQ(log_line("zavGetModel", 4, 22, "Failed to call zavGetModelBIOS()."), 0);
     EXPECT_EQ(record().log,
               std::vector{row("zavGetModel", 4, "[22] Failed to call zavGetModelBIOS().")});
+    EXPECT_FALSE(record().log_is_open);
 }
 
 TEST_F(Log, TakesNegativeNumbersAndPercentSigns) {
