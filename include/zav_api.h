@@ -298,7 +298,7 @@ char *getTableEntrySMBIOS(int type);
 /* ==== Disk state ==============================================================================*/
 
 /**
- * Is this disk present and healthy? `dev` is a whole disk (part 0) of minor type
+ * Is this disk present and healthy? `dev` is a whole disk (no partition) of minor type
  * ZAV_MINDEV_HDD_SATA, _HWSATA or _SAS. Presence is told by the device node, health by the exit
  * status of "smartctl -H -d ata".
  *

@@ -8,9 +8,7 @@ namespace zav {
 constexpr int kAlert = 1;   // LOG_ALERT
 constexpr int kWarning = 4; // LOG_WARNING
 
-// Trace types, compared with the level 1 at which nearly all messages are issued: failures are
-// printed, the others stay silent.
-constexpr int kTraceFailure = 1;
+// Trace types, compared with the level 1 at which nearly all messages are issued: these stay silent.
 constexpr int kTraceCommand = 2;
 constexpr int kTraceStep = 3;
 constexpr int kTraceParser = 4;
