@@ -99,9 +99,10 @@ fs::path resolved_command(const std::string &word) {
 
 // The shim for 32-bit programs is built beside the 64-bit one, or in the 32-bit tree beside this.
 fs::path find_shim32(const fs::path &directory) {
+    std::error_code unreadable;
     for (const fs::path &candidate : {directory / "libzavsim-shim32.so",
                                       directory.parent_path() / "build-m32/libzavsim-shim.so"})
-        if (fs::exists(candidate))
+        if (fs::exists(candidate, unreadable))
             return candidate;
     return {};
 }
@@ -216,7 +217,7 @@ int run_in_private_root(Options options) {
     std::error_code error;
     options.directory = fs::current_path(error);
     options.program_directory = self.parent_path();
-    options.has_shim = !options.bare && fs::exists(self.parent_path() / "libzavsim-shim.so");
+    options.has_shim = !options.bare && fs::exists(self.parent_path() / "libzavsim-shim.so", error);
 
     Channel channel;
     Words args = bubblewrap_arguments(options, self);
