@@ -19,6 +19,7 @@ constexpr int could_not_write = 3;
 // Writes the answer; a failure is told, and is the exit status. When the reader is gone there is
 // nobody to tell, as with any filter: the status alone says so.
 int written(const Streams &streams, const std::string &text, int status) {
+    stay_if_ending();
     const int error = streams.write(text);
     if (error == 0)
         return status;

@@ -2,6 +2,7 @@
 
 #include "run.h"
 
+#include <atomic>
 #include <csignal>
 #include <initializer_list>
 #include <thread>
@@ -11,6 +12,8 @@ namespace zavctl {
 
 namespace {
 
+std::atomic<bool> ending = false;
+
 bool is_ignored(int number) {
     struct sigaction action {};
     return sigaction(number, nullptr, &action) == 0 && action.sa_handler == SIG_IGN;
@@ -18,6 +21,7 @@ bool is_ignored(int number) {
 
 // Ends like a program that has no handler for the signal, so that a calling shell stops too.
 [[noreturn]] void end_by(int number) {
+    ending = true;
     kill_descendants();
     if (isatty(STDERR_FILENO) == 1) {
         constexpr char erase_line[] = "\r\033[K";
@@ -46,6 +50,11 @@ void end_on_interrupt() {
         if (sigwait(&set, &number) == 0)
             end_by(number);
     }).detach();
+}
+
+void stay_if_ending() {
+    while (ending)
+        pause();
 }
 
 } // namespace zavctl

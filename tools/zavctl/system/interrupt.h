@@ -8,4 +8,8 @@ namespace zavctl {
 // alone dies of it, and its end would be taken for an answer. Call before any thread is started.
 void end_on_interrupt();
 
+// Does not return once the end has begun: what the tools say that are being ended is no answer.
+// Call before telling anything.
+void stay_if_ending();
+
 } // namespace zavctl
