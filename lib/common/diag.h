@@ -8,7 +8,8 @@ namespace zav {
 constexpr int kAlert = 1;   // LOG_ALERT
 constexpr int kWarning = 4; // LOG_WARNING
 
-// Trace types, compared with the level 1 at which nearly all messages are issued: these stay silent.
+// Trace types. They are compared with level 1, at which nearly all messages are issued: these stay
+// silent.
 constexpr int kTraceCommand = 2;
 constexpr int kTraceStep = 3;
 constexpr int kTraceParser = 4;
