@@ -289,9 +289,10 @@ char *smbios_string(struct smbios_header *entry, int index);
 /**
  * Product name (type 1) or board serial number (type 2), at most 20 characters, from the SMBIOS
  * table in physical memory (/dev/mem): of the first structure of that type behind the table's
- * first structure. Empty if there is none, if the table cannot be found or for any other type;
- * null if /dev/mem cannot be opened. Failures are told on standard output. The result is one
- * static buffer that the next call overwrites: one thread at a time.
+ * first structure. If there is none, for any other type, and if the table cannot be found, the
+ * result is what the last call left, empty at first; null if /dev/mem cannot be opened. Failures
+ * are told on standard output. The result is one static buffer that the next call overwrites: one
+ * thread at a time.
  */
 char *getTableEntrySMBIOS(int type);
 
