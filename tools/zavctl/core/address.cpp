@@ -3,14 +3,14 @@
 #include <fmt/format.h>
 
 #include <algorithm>
+#include <charconv>
 
 namespace zavctl {
 
 namespace {
 
-std::string group_name(int group) {
-    return group == 0 ? "PrimaryOSVG" : fmt::format("DataVG{}", group);
-}
+constexpr std::string_view system_group = "PrimaryOSVG";
+constexpr std::string_view data_group = "DataVG";
 
 bool is_unit_device(int minor_type) {
     return minor_type == ZAV_MINDEV_HDD_SAS || minor_type == ZAV_MINDEV_RAID_SAS;
@@ -31,7 +31,7 @@ std::string volume_in_words(const zavDevice &device) {
     case ZAV_MINDEV_LVM_LV:
         return fmt::format("logical volume {} of group {}", device.disk, group_name(device.part));
     default:
-        return "physical volume";
+        return fmt::format("physical volume {} of group {}", device.disk, group_name(device.part));
     }
 }
 
@@ -85,6 +85,24 @@ std::vector<std::string> minor_words(const std::string &type_word) {
         if (type_word == minor.type_word)
             words.emplace_back(minor.word);
     return words;
+}
+
+std::string group_name(int number) {
+    return number == 0 ? std::string(system_group) : fmt::format("{}{}", data_group, number);
+}
+
+std::optional<int> group_number(std::string_view name) {
+    if (name == system_group)
+        return 0;
+    if (!name.starts_with(data_group))
+        return std::nullopt;
+    const std::string_view digits = name.substr(data_group.size());
+    int number = 0;
+    const auto [end, error] = std::from_chars(digits.data(), digits.data() + digits.size(), number);
+    const bool whole = error == std::errc() && end == digits.data() + digits.size();
+    if (!whole || number < 1 || digits.front() == '0')
+        return std::nullopt;
+    return number;
 }
 
 std::string in_words(const zavDevice &device) {

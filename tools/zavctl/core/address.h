@@ -7,6 +7,7 @@
 
 #include <optional>
 #include <string>
+#include <string_view>
 #include <vector>
 
 namespace zavctl {
@@ -36,6 +37,12 @@ const MinorType *find_minor_type(int code);
 
 std::vector<std::string> type_words();
 std::vector<std::string> minor_words(const std::string &type_word);
+
+// "PrimaryOSVG", "DataVG3".
+std::string group_name(int number);
+
+// The number of a group's name; none for another name.
+std::optional<int> group_number(std::string_view name);
 
 // "partition 2 of SATA disk 3", "volume 3 of group DataVG2", "Ethernet port eth0".
 std::string in_words(const zavDevice &device);
