@@ -356,6 +356,272 @@ int getRaidStateISCSI(zavDevice *dev, zavRaidState *info);
 int getRaidStateHW(zavDevice *dev, zavRaidState *info);
 int getRaidStateSAS(zavDevice *dev, zavRaidState *info);
 
+/* ==== Exchanging a disk =======================================================================
+ *
+ * These act on the running machine; none takes a lock, and nothing is rolled back when a later
+ * step fails. Do not run two of them at the same time. They trust nothing a disk says about
+ * itself: an array name read from a superblock goes to the shell as one word.
+ */
+
+/**
+ * Takes the disk `diskdev`, a whole motherboard SATA disk, out of service: another healthy disk
+ * must remain, the disk's partitions are failed and removed from their arrays (zavRmSWRaidDev:
+ * what lives on an array without redundancy is destroyed), then the kernel forgets the disk
+ * (zavHotCmd). A disk that has vanished already can still be taken out of its arrays.
+ *
+ * The code tells how the steps went, not what the arrays look like now: with an mdadm whose scan
+ * prints no level word no member is removed, and the disk is detached all the same. Ask
+ * zavGetStateRaid afterwards.
+ *
+ * ZAV_RC_OK          done
+ * ZAV_RC_ERR_EINVAL  null pointer, types, partition, model (logged); slot number, or no other
+ *                    healthy disk (silent): nothing was changed
+ * ZAV_RC_ERR_ENOMEM  no memory; nothing was changed
+ * ZAV_RC_ERR         the remaining disk's node cannot be opened, or mdadm finds its superblocks
+ *                    inconsistent ("mismatch"): nothing was changed
+ * 32                 mdadm cannot be started
+ * others             as zavGetModelConfig, zavRmSWRaidDev and zavHotCmd return them
+ *
+ * Blocks 5 seconds and as long as zavRmSWRaidDev does, and about 20 seconds for every empty slot
+ * below the first healthy disk.
+ */
+int zavDiskHotRemove(zavDevice *diskdev);
+
+/**
+ * Brings the new disk `diskdev` into service. THE DISK IS WIPED. The first active member of
+ * /dev/md0 tells the healthy disk whose partition table is copied; the disk is attached if the
+ * kernel does not know it yet, marked as the appliance's (bytes 0x4D 0x10 at offset 440) and given
+ * to zavAddSWRaidDev. The healthy disk is found through mdadm --detail and udevinfo.
+ *
+ * ZAV_RC_OK          every step ran. The exit statuses of the wiping, copying and marking commands
+ *                    are not looked at, nor whether the arrays took the disk: ask zavGetStateRaid.
+ * ZAV_RC_ERR_EINVAL  null pointer, types, partition, slot, model; no active member of /dev/md0
+ *                    found, or its disk has no name here, or it is the disk to add: nothing was
+ *                    changed
+ * ZAV_RC_ERR_ENOMEM  no memory; nothing was changed
+ * ZAV_RC_ERR         the healthy disk's node cannot be opened; nothing was changed
+ * others             as zavGetModelConfig, zavHotCmd and zavAddSWRaidDev return them
+ *
+ * Blocks 6 seconds, 10 more if the disk has to be attached, and as long as zavAddSWRaidDev does.
+ */
+int zavDiskHotAdd(zavDevice *diskdev);
+
+/**
+ * Takes the partitions of disk `tdev` out of the arrays in which `sdev`, a healthy disk, has the
+ * partitions of the same numbers, from 15 down to 1. Both are whole SATA disks. Which array that
+ * is, and its level, is asked of "mdadm --query --examine --scan"; a partition for which mdadm
+ * names no array, no level, or a name of more than 31 characters is skipped.
+ *
+ * raid1, raid5, raid10: the member is failed and removed. If the target's partition has vanished,
+ * the faulty member's device numbers are read from mdadm --detail and a node of these numbers,
+ * /dev/sata/hotrmtmp, stands in for it; an array without a faulty spare is left as it is.
+ * raid0, linear: volumes are unmounted and REMOVED, the volume group and the physical volume too,
+ * and the array is stopped.
+ *
+ * ZAV_RC_OK          done, also if no partition needed work; what mdadm answers is not looked at
+ * ZAV_RC_ERR_EINVAL  null pointer
+ * ZAV_RC_ERR         the data RAID type is not known, or an array cannot be stopped
+ * ZAV_RC_ERR_EBUSY   an array without redundancy is in use ("Error: ..." goes to standard output)
+ * ZAV_RC_ERR_ENOMEM  no memory
+ * 32                 a tool cannot be started
+ * others             as zavGetStateLVM and zavGetPVsVG return them
+ *
+ * The first error ends the work; what was done stays done. Blocks 3 seconds per redundant array,
+ * 2 per other array, and as long as zavGetStateLVM does for its group.
+ */
+int zavRmSWRaidDev(zavDevice *sdev, zavDevice *tdev);
+
+/**
+ * Adds the partitions of disk `tdev`, prepared like disk `sdev`, to the arrays of the source's
+ * partitions, from 1 up to 15. A degraded or rebuilding array gets the partition as a member. A
+ * failed or missing one is CREATED ANEW once all disks of the model are present, with partition 2
+ * of every disk and the name MD1 whichever array it was, and "/usr/bin/hbqSetup.sh lvmrestore"
+ * makes its volumes again; their content is lost. Where the source's partition belongs to no
+ * array, hbqSetup.sh sets the array (unless the data RAID type is 1) and the volumes up.
+ *
+ * ZAV_RC_OK          done, also if nothing needed work; what the tools answer is not looked at
+ * ZAV_RC_ERR_EINVAL  null pointer
+ * ZAV_RC_ERR         the data RAID type is not known
+ * ZAV_RC_ERR_ENOMEM  no memory
+ * 32                 mdadm cannot be started; ends the work
+ * others             as zavGetModelConfig returns them, or zavGetStateRaid's of an array that could
+ *                    not be asked (the work goes on, and a later success makes it 0)
+ *
+ * Blocks as long as the tools take, 10 seconds more for an array that is created anew, and as long
+ * as zavGetStateRaid does for each array.
+ */
+int zavAddSWRaidDev(zavDevice *sdev, zavDevice *tdev);
+
+/**
+ * Attaches (`cmd` 1) or detaches (`cmd` 2) the SATA disk in slot dev->disk, 1 to 4. Slot N is the
+ * N-th host, by number, of the controller in /sys/devices/pci0000:00/0000:00:1f.2.
+ *
+ * ZAV_RC_OK          the line was given to the kernel; whether it took it is only logged
+ * ZAV_RC_ERR_EINVAL  null pointer, types, command or slot
+ * ZAV_RC_ERR_ENOENT  the controller's directory cannot be read
+ * ZAV_RC_ERR_ENODEV  the controller has fewer hosts than that; nothing was written
+ *
+ * Does not wait for the node to come or go.
+ */
+int zavHotCmd(int cmd, zavDevice *dev);
+
+/** Writes "scsi add-single-device H C I L" (`cmd` 1) or "scsi remove-single-device H C I L" (2) to
+ *  /proc/scsi/scsi. Failures are logged only. */
+void zavScsiCmd(int cmd, int host, int channel, int id, int lun);
+
+/**
+ * Detaches the disk in slot dev->disk, 1 to 4, through a shell pipeline, whose outcome is not
+ * looked at, and waits 10 seconds. Does nothing for another slot or a null pointer. The pipeline
+ * counts hosts with one digit only and, where the controller's directory has none, reaches HOST 0:
+ * prefer zavHotCmd.
+ */
+void zavSATARemove(zavDevice *dev);
+
+/**
+ * Attaches the disk in slot dev->disk through a shell pipeline (see zavSATARemove), waits 20
+ * seconds and reads the disk's mark (offset 440). A disk that carries the appliance's mark, 0x104D,
+ * is refused: it is detached again, and only the log tells.
+ *
+ * 0                  attached, or detached again: marked, unreadable, or the attaching took 30
+ *                    seconds or more
+ * ZAV_RC_ERR_EINVAL  null pointer, types, model, slot: nothing was run
+ * others             zavGetModelConfig's and zavDevToStr's codes; a positive errno when the node
+ *                    cannot be opened or read at (detached again); a negated errno when there is
+ *                    no time of day
+ *
+ * Blocks at least 20 seconds, 10 more when the disk is detached again.
+ */
+int zavSATARescan(zavDevice *dev);
+
+/* ==== Logical volumes =========================================================================
+ *
+ * Volume group 0 is the system group "PrimaryOSVG", group N the data group "DataVG<N>". Addresses:
+ *   group            {ZAV_DEV_LVM, ZAV_MINDEV_LVM_VG, group, 0}
+ *   logical volume   {ZAV_DEV_LVM, ZAV_MINDEV_LVM_LV, n, group}: LogVol<n>
+ *   physical volume  {ZAV_DEV_LVM, ZAV_MINDEV_LVM_PV, n, group}: pv<n-1> of the metadata
+ * Sizes are in GB of 2^30 bytes, rounded down and one added: 3 GB exactly read as 4. Usages are
+ * percentages of the mounted file system. The answers come from the LVM tools in /usr/sbin.
+ */
+
+/**
+ * State and layout of the volume group, physical volume or logical volume `dev`.
+ *
+ * Group (info->dev.lvmvgdev): size, counts, volumes; state ZAV_LVM_NORMAL, with ZAV_LVM_INACTIVE
+ * when one of its logical volumes is; ZAV_LVM_FAILED when it does not answer; ZAV_LVM_NOT_EXIST.
+ * Counts may exceed the tables, which hold the first 9 physical and 6 logical volumes.
+ * Logical volume (lvmlvdev), 1 to 6 of the system group, 1 to 4 of a data group: state 0 when
+ * present and healthy (NOT ZAV_LVM_NORMAL), ZAV_LVM_FULL above 90.0 % usage, ZAV_LVM_FAILED,
+ * ZAV_LVM_INACTIVE, ZAV_LVM_NOT_EXIST. Sizes saturate at 1024 GB; 0 is not known.
+ * Physical volume (lvmpvdev): size, group and the disk or array under it; ZAV_LVM_NORMAL,
+ * ZAV_LVM_FAILED or ZAV_LVM_NOT_EXIST, by the state of what is under it and by pvs.
+ *
+ * ZAV_RC_OK            as above
+ * ZAV_RC_ERR_EINVAL    null pointer, types (record untouched), number out of range
+ * ZAV_RC_ERR_ENOENT    one of the six LVM tools is missing (record untouched)
+ * ZAV_RC_ERR_ESTRPIPE  a tool cannot be started
+ * 0x2801               a logical volume's mount point cannot be measured; everything else is filled
+ * ZAV_RC_ERR           a lock, a tool's report or its file is not to be had; a physical volume lies
+ *                      on a device whose address is not known (its entry keeps SATA disk 0); a
+ *                      logical volume's node is not accessible. What was read is filled in.
+ * others               of a physical volume: as zavGetStateDisk and zavGetStateRaid return them
+ *
+ * Queries of groups and physical volumes keep the tools' output in files of /etc/Kiru/zav (.vgs,
+ * .vgdisplay.<group>, <group>) and hold semaphore 0x6911 meanwhile, for as long as another process
+ * holds it waiting before. A missing volume's node is looked for three times, 10 seconds apart: a
+ * logical volume blocks up to 20 seconds, a group that for every volume without a node.
+ */
+int zavGetStateLVM(zavDevice *dev, zavLVMState *info);
+
+/** Readers by minor type. A null pointer is ZAV_RC_ERR_EINVAL; other checks are the caller's. */
+int zavgetStateLVMVG(zavDevice *dev, zavLVMState *info);
+int zavgetStateLVMLV(zavDevice *dev, zavLVMState *info);
+int zavgetStateLVMPV(zavDevice *dev, zavLVMState *info);
+
+/**
+ * The mount point of the logical volume `dev`: "/mnt/prios/disk1p<n>" in the system group,
+ * "/mnt/internal/data<group>-<n>" in a data group. `mntpath` must hold 42 bytes (30 for numbers of
+ * up to five digits).
+ *
+ * ZAV_RC_OK, or ZAV_RC_ERR_EINVAL for a null pointer.
+ */
+int zavDevToMnt(zavDevice *dev, char *mntpath);
+
+/**
+ * Usage of the logical volume's file system in percent: what unprivileged users cannot have of all
+ * its blocks; 0 for a file system without blocks. Whatever is mounted where the volume belongs is
+ * measured, the directory's own file system if nothing is.
+ *
+ * ZAV_RC_OK, ZAV_RC_ERR_EINVAL for a null pointer, 0x2801 when the mount point cannot be measured
+ * (`usage` is untouched).
+ */
+int zavgetFSusage(zavDevice *dev, float *usage);
+
+/** The group's name: number 0 is "PrimaryOSVG", N "DataVG<N>". `strVGName` must hold 18 bytes.
+ *  ZAV_RC_OK; ZAV_RC_ERR_EINVAL for ZAV_LVM_VG_NONE (-1, "ZAV_LVM_VG_NONE" is written) and for
+ *  a null pointer. */
+int zavMapVGToStr(int iVG, char *strVGName);
+
+/** The number of a group's name, the reverse of zavMapVGToStr. "PrimaryOSVG" may stand anywhere in
+ *  the text, "DataVG" must begin it. ZAV_RC_OK; ZAV_RC_ERR for another text or a null pointer,
+ *  `*iVG` is untouched. */
+int zavMapStrToVG(char *strVGName, int *iVG);
+
+/** Turns a line "key = value # comment" of LVM's metadata into its value, in place. The value is
+ *  cut at 79 characters; without a value the text becomes "". */
+void zavParserLine1(char *pBuf);
+
+/**
+ * The name of the volume group that the physical volume at the device path `pvname` belongs to,
+ * from pvdisplay; "NONE" for one that belongs to none. `vgname` must hold 128 bytes. The name is as
+ * the disk tells it, and may hold any character but a blank: quote it before a shell sees it.
+ *
+ * ZAV_RC_OK, ZAV_RC_ERR_EINVAL for a null pointer, ZAV_RC_ERR_ENODEV when it is no physical volume,
+ * 32 when pvdisplay cannot be started, ZAV_RC_ERR when it prints no group line.
+ */
+int zavGetPVsVG(char *pvname, char *vgname);
+
+/** The same as an address: {ZAV_DEV_LVM, ZAV_MINDEV_LVM_VG, group, 0}, group 99 for a name that is
+ *  not one of the appliance's. Codes as zavGetPVsVG; `*vgdev` is untouched unless ZAV_RC_OK. */
+int zavGetPVsVGDev(char *pvname, zavDevice *vgdev);
+
+/** Are the LVM tools vgs, lvs, pvs, vgdisplay, lvdisplay and pvdisplay in /usr/sbin? ZAV_RC_OK, or
+ *  ZAV_RC_ERR_ENOENT; the first that is missing is logged. */
+int zavCheckExeFile(void);
+
+/**
+ * Makes `dev`, a whole SATA disk or an array, a physical volume of the group `lvmdev`, which
+ * is created if it does not exist. The device must answer its state query; the state found does not
+ * matter, and what is on the device is for pvcreate to notice.
+ *
+ * ZAV_RC_OK          done
+ * ZAV_RC_ERR_EINVAL  null pointer, types; the state query fails (a partition has none); no path;
+ *                    group -1 (the device is a physical volume by then)
+ * ZAV_RC_ERR         pvcreate, vgcreate or vgextend failed (logged); after the first of them the
+ *                    device stays a physical volume
+ *
+ * What vgcreate and vgextend print goes to the caller's standard output and error. Takes no lock:
+ * do not run it while zavLVMHotRemove works on the group. Blocks as long as the tools and the state
+ * query do.
+ */
+int zavLVMHotAdd(zavDevice *dev, zavDevice *lvmdev);
+
+/**
+ * Dismantles the group `lvmdev`. ITS VOLUMES ARE DESTROYED: every logical volume is unmounted and
+ * removed, then the group, then the labels of its physical volumes.
+ *
+ * ZAV_RC_OK          done
+ * ZAV_RC_ERR_EINVAL  null pointer, types, group -1
+ * ZAV_RC_ERR_ENODEV  there is no such group; nothing was changed
+ * ZAV_RC_ERR_EBUSY   a volume is mounted and in use; those before it are gone
+ * ZAV_RC_ERR         a lock cannot be had; vgremove failed, the labels are still there; or a volume
+ *                    or label could not be removed while the rest went on
+ * others             as the query of the group returns them; nothing was changed
+ *
+ * Holds semaphore 0x3231, during the query also 0x6911. Blocks as long as the query and the tools.
+ * vgremove asks on the caller's standard input when volumes are left: leave nothing there to read.
+ */
+int zavLVMHotRemove(zavDevice *lvmdev);
+
 #ifdef __cplusplus
 }
 #endif

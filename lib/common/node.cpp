@@ -1,9 +1,11 @@
 #include "node.h"
 
 #include "diag.h"
+#include "owner.h"
 
 #include <cerrno>
 #include <cstring>
+#include <fcntl.h>
 #include <unistd.h>
 
 namespace zav {
@@ -34,6 +36,10 @@ NodeProbe probe_node(const char *reporter, const char *path) {
     }
     return {means_missing(error) ? NodeProbe::Result::kMissing : NodeProbe::Result::kInaccessible,
             error};
+}
+
+bool node_opens(const char *path) {
+    return static_cast<bool>(Descriptor(open(path, O_RDONLY | O_CLOEXEC)));
 }
 
 void log_missing_node(const char *reporter, const char *kind, const char *path, int error) {

@@ -12,6 +12,9 @@ struct NodeProbe {
 // a missing node are logged under the name `reporter`.
 NodeProbe probe_node(const char *reporter, const char *path);
 
+// Can the node be opened for reading?
+bool node_opens(const char *path);
+
 // The log line of a node that stayed missing; `kind` is "Device" or "md".
 void log_missing_node(const char *reporter, const char *kind, const char *path, int error);
 

@@ -2,6 +2,7 @@
 #pragma once
 
 #include <cstdio>
+#include <cstdlib>
 #include <unistd.h>
 #include <utility>
 
@@ -50,6 +51,22 @@ class Descriptor {
 
   private:
     int fd_;
+};
+
+// A plain record on the heap, all zero; false without memory.
+template <class Record>
+class HeapRecord {
+  public:
+    HeapRecord() : record_(static_cast<Record *>(calloc(1, sizeof(Record)))) {}
+    HeapRecord(const HeapRecord &) = delete;
+    HeapRecord &operator=(const HeapRecord &) = delete;
+    ~HeapRecord() { free(record_); }
+
+    explicit operator bool() const { return record_ != nullptr; }
+    Record &operator*() const { return *record_; }
+
+  private:
+    Record *record_;
 };
 
 } // namespace zav

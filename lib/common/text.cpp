@@ -29,6 +29,10 @@ int32_t to_int(const char *text) {
     return static_cast<int32_t>(std::clamp<long long>(number, INT32_MIN, INT32_MAX));
 }
 
+int64_t to_int64(const char *text) {
+    return strtoll(text, nullptr, 10);
+}
+
 // strtoul negates what follows a minus sign within its width and saturates by magnitude.
 uint32_t to_unsigned(const char *text) {
     const char *digits = text + strspn(text, " \t\n\v\f\r");
@@ -62,6 +66,19 @@ void copy_text(char *to, size_t size, const char *from) {
     const size_t length = strnlen(from, size - 1);
     memcpy(to, from, length);
     to[length] = '\0';
+}
+
+bool number_after(const char *text, const char *prefix, int32_t &number) {
+    if (!starts_with(text, prefix))
+        return false;
+    const char *start = text + strlen(prefix);
+    const char *digits = start + strspn(start, " \t\n\v\f\r");
+    if (*digits == '-' || *digits == '+')
+        ++digits;
+    if (*digits < '0' || *digits > '9')
+        return false;
+    number = to_int(start);
+    return true;
 }
 
 bool contains(const char *text, const char *part) {
