@@ -25,8 +25,9 @@ constexpr const char *footer =
     "  zavsim act SENTENCE...   e.g. zavsim act disk 3 fails\n"
     "  zavsim state             the model as JSON\n\n"
     "Sentences (a scenario file holds lines \"at 10s SENTENCE\"):\n"
-    "  disk N fails | vanishes | appears | joins\n"
-    "  array N checks | repairs\n"
+    "  disk N fails | vanishes | appears | joins | detaches | attaches\n"
+    "  array N checks | repairs | stops\n"
+    "  volume G-N fills 95% | is active | is inactive | is busy | is idle\n"
     "  tool NAME hangs 30s | prints \"TEXT\" | exits N | is missing | works again";
 
 class HelpPage : public CLI::Formatter {
@@ -54,6 +55,10 @@ void declare(CLI::App &app, Options &options) {
     app.add_option("--tools", options.tools,
                    "Whose texts the tools print: the appliance's own, or a current Linux's")
         ->check(CLI::IsMember({"appliance", "current"}))
+        ->capture_default_str();
+    app.add_option("--hosts", options.hosts,
+                   "Where sysfs has the disk controller's hosts: in its directory, or below ataN")
+        ->check(CLI::IsMember({"direct", "ata"}))
         ->capture_default_str();
     app.add_option("--time-scale", options.time_scale, "Appliance seconds per real second")
         ->check(CLI::Range(0.01, 100000.0))

@@ -19,6 +19,7 @@ struct Options {
     std::string raidtype;
     std::string level;
     std::string tools = "appliance";
+    std::string hosts = "direct";
     std::string shell = "bash";
     std::string scenario;      // text of the scenario file, already checked
     std::string scenario_file; // its name, for messages
@@ -30,9 +31,9 @@ struct Options {
     std::vector<std::string> command;
 };
 
-NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(Options, model, product, serial, raidtype, level, tools, shell,
-                                   scenario, scenario_file, time_scale, bare, has_shim, directory,
-                                   program_directory, command)
+NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(Options, model, product, serial, raidtype, level, tools, hosts,
+                                   shell, scenario, scenario_file, time_scale, bare, has_shim,
+                                   directory, program_directory, command)
 
 // The options as one word of a command line, and back. Their texts are bytes, not characters.
 std::string to_word(const Options &options);

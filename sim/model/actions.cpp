@@ -1,8 +1,10 @@
 #include "model/actions.hpp"
 
 #include "model/arrays.hpp"
+#include "model/contents.hpp"
 #include "model/disks.hpp"
 #include "model/sentences.hpp"
+#include "model/volumes.hpp"
 
 #include <algorithm>
 #include <fmt/format.h>
@@ -34,12 +36,30 @@ std::string disk_fails(State &state, Disk &disk) {
     return {};
 }
 
+// The kernel gives a disk up that stays in its slot, with all that it holds.
+std::string disk_detaches(State &state, Disk &disk) {
+    if (!disk.attached)
+        return fmt::format("there is no disk {}", disk.slot);
+    detach(state, disk);
+    fail_members(state, disk);
+    return {};
+}
+
+std::string disk_attaches(State &state, Disk &disk) {
+    if (!disk.inserted || disk.attached)
+        return fmt::format("disk {} {}", disk.slot,
+                           disk.attached ? "is attached" : "is not in its slot");
+    attach(state, disk);
+    return {};
+}
+
 std::string disk_vanishes(State &state, Disk &disk) {
     if (!disk.inserted)
         return fmt::format("there is no disk {}", disk.slot);
-    detach(state, disk);
+    if (disk.attached)
+        disk_detaches(state, disk);
     disk.inserted = false;
-    fail_members(state, disk);
+    forget_lost(state);
     return {};
 }
 
@@ -48,6 +68,7 @@ std::string disk_appears(State &state, Disk &disk) {
         return fmt::format("disk {} is in its slot", disk.slot);
     disk = blank_disk(state, disk.slot);
     attach(state, disk);
+    forget_lost(state);
     return {};
 }
 
@@ -60,7 +81,7 @@ const Disk *pattern_for(const State &state, const Disk &disk) {
 
 void copy_partitions(const Disk &pattern, Disk &disk) {
     for (const Partition &partition : pattern.partitions)
-        disk.partitions.push_back({partition.number, partition.kib, std::nullopt});
+        disk.partitions.push_back({partition.number, partition.start, partition.kib, std::nullopt});
 }
 
 void drop_faulty_members_of_slot(Array &array, int slot) {
@@ -80,6 +101,7 @@ std::string disk_joins(State &state, Disk &disk) {
         return fmt::format("no other disk has partitions for disk {}", disk.slot);
     if (disk.partitions.empty())
         copy_partitions(*pattern, disk);
+    disk.label_id = (disk.label_id & 0xffff0000U) | disk_mark;
     // From the first array on: the one that asks first rebuilds first.
     for (auto array = state.arrays.rbegin(); array != state.arrays.rend(); ++array) {
         drop_faulty_members_of_slot(*array, disk.slot);
@@ -100,6 +122,10 @@ std::string act_on_disk(State &state, const Action &action) {
         return disk_vanishes(state, *disk);
     case Action::Kind::disk_appears:
         return disk_appears(state, *disk);
+    case Action::Kind::disk_detaches:
+        return disk_detaches(state, *disk);
+    case Action::Kind::disk_attaches:
+        return disk_attaches(state, *disk);
     default:
         return disk_joins(state, *disk);
     }
@@ -109,11 +135,65 @@ std::string act_on_array(State &state, const Action &action) {
     Array *array = find_array(state, action.number - 1);
     if (array == nullptr)
         return fmt::format("there is no array {}", action.number);
+    if (action.kind == Action::Kind::array_stops)
+        return stop_array(state, array->minor) == Refusal::none
+                   ? ""
+                   : fmt::format("array {} is in use", action.number);
     const SyncKind kind =
         action.kind == Action::Kind::array_checks ? SyncKind::check : SyncKind::repair;
     if (start_scrub(state, *array, kind) != Refusal::none)
         return fmt::format("array {} is busy or has no redundancy", action.number);
     return {};
+}
+
+std::string take_volume_away(const Group &group, Volume &volume) {
+    if (volume.busy)
+        return fmt::format("volume {}/{} is busy", group.name, volume.name);
+    volume.mount_point.clear();
+    volume.active = false;
+    volume.minor = -1;
+    return {};
+}
+
+std::string bring_volume_back(State &state, const Group &group, Volume &volume) {
+    if (!activate(state, volume).empty())
+        return fmt::format("volume {}/{} lies on what is gone", group.name, volume.name);
+    if (volume.file_system)
+        volume.mount_point = usual_mount_point(group.name, volume.name);
+    return {};
+}
+
+std::string fill_volume(const Group &group, Volume &volume, int percent) {
+    if (!volume.file_system)
+        return fmt::format("volume {}/{} has no file system", group.name, volume.name);
+    fill_file_system(*volume.file_system, percent);
+    return {};
+}
+
+std::string set_busy(const Group &group, Volume &volume, bool busy) {
+    if (volume.mount_point.empty())
+        return fmt::format("volume {}/{} is not mounted", group.name, volume.name);
+    volume.busy = busy;
+    return {};
+}
+
+std::string act_on_volume(State &state, const Action &action) {
+    Group *group = find_group(state, action.group == 0 ? "PrimaryOSVG"
+                                                       : fmt::format("DataVG{}", action.group));
+    Volume *volume =
+        group == nullptr ? nullptr : find_volume(*group, fmt::format("LogVol{}", action.number));
+    if (volume == nullptr)
+        return fmt::format("there is no volume {}-{}", action.group, action.number);
+    switch (action.kind) {
+    case Action::Kind::volume_fills:
+        return fill_volume(*group, *volume, action.percent);
+    case Action::Kind::volume_is_active:
+        return bring_volume_back(state, *group, *volume);
+    case Action::Kind::volume_is_inactive:
+        return take_volume_away(*group, *volume);
+    default:
+        return set_busy(*group, *volume, action.kind == Action::Kind::volume_is_busy);
+    }
 }
 
 ToolFault &fault_of(State &state, const std::string &tool) {
@@ -139,10 +219,13 @@ void act_on_tool(State &state, const Action &action) {
 }
 
 bool is_about_disk(Action::Kind kind) {
-    return kind <= Action::Kind::disk_joins;
+    return kind <= Action::Kind::disk_attaches;
 }
 bool is_about_array(Action::Kind kind) {
-    return kind == Action::Kind::array_checks || kind == Action::Kind::array_repairs;
+    return kind > Action::Kind::disk_attaches && kind <= Action::Kind::array_stops;
+}
+bool is_about_volume(Action::Kind kind) {
+    return kind > Action::Kind::array_stops && kind <= Action::Kind::volume_is_idle;
 }
 
 } // namespace
@@ -152,6 +235,8 @@ std::string perform(State &state, const Action &action) {
         return act_on_disk(state, action);
     if (is_about_array(action.kind))
         return act_on_array(state, action);
+    if (is_about_volume(action.kind))
+        return act_on_volume(state, action);
     act_on_tool(state, action);
     return {};
 }
@@ -174,10 +259,9 @@ void scsi_command(State &state, const std::string &line) {
         if (disk.host != host || !disk.inserted)
             continue;
         if (verb == "add-single-device" && !disk.attached) {
-            attach(state, disk);
+            disk_attaches(state, disk);
         } else if (verb == "remove-single-device" && disk.attached) {
-            detach(state, disk);
-            fail_members(state, disk);
+            disk_detaches(state, disk);
         }
     }
 }

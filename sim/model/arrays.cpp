@@ -28,10 +28,12 @@ bool alive(const Array &array, int raid_device) {
     return member != nullptr && member->role == Role::in_sync;
 }
 
-// Two near copies: places 0 and 1 mirror each other, 2 and 3, and so on.
+// Two near copies: places 0 and 1 mirror each other, 2 and 3, and so on. With an odd number of
+// places every two neighbours share something, around the end.
 bool has_lost_pair(const Array &array) {
-    for (int first = 0; first + 1 < array.raid_devices; first += 2)
-        if (!alive(array, first) && !alive(array, first + 1))
+    const int count = array.raid_devices;
+    for (int first = 0; first < count; first += count % 2 == 0 ? 2 : 1)
+        if (!alive(array, first) && !alive(array, (first + 1) % count))
             return true;
     return false;
 }
@@ -42,9 +44,13 @@ bool holds_last_copy(const Array &array, const Member &member) {
         return false;
     if (array.level == "raid1")
         return count_members(array, Role::in_sync) == 1;
-    if (array.level == "raid10")
-        return !alive(array, member.raid_device ^ 1);
-    return !is_redundant(array);
+    if (array.level != "raid10")
+        return !is_redundant(array);
+    Array without = array;
+    for (Member &each : without.members)
+        if (each.raid_device == member.raid_device)
+            each.role = Role::faulty;
+    return !has_lost_pair(array) && has_lost_pair(without);
 }
 
 // After more faults than it can bear an array takes no member in.
@@ -100,9 +106,10 @@ const Array *find_array(const State &state, int minor) {
 }
 
 const Array *array_of_uuid(const State &state, const std::string &uuid) {
-    for (const Array &array : state.arrays)
-        if (array.uuid == uuid)
-            return &array;
+    for (const auto *list : {&state.arrays, &state.stopped})
+        for (const Array &array : *list)
+            if (array.uuid == uuid)
+                return &array;
     return nullptr;
 }
 
@@ -139,12 +146,11 @@ int count_members(const Array &array, Role role) {
 
 std::uint64_t array_kib(const Array &array) {
     const auto devices = static_cast<std::uint64_t>(array.raid_devices);
-    const std::uint64_t parts = array.level == "raid1"    ? 1
-                                : array.level == "raid5"  ? devices - 1
-                                : array.level == "raid6"  ? devices - 2
-                                : array.level == "raid10" ? devices / 2
-                                                          : devices;
-    return array.component_kib * parts;
+    const std::uint64_t parts = array.level == "raid1"   ? 1
+                                : array.level == "raid5" ? devices - 1
+                                : array.level == "raid6" ? devices - 2
+                                                         : devices;
+    return array.component_kib * parts / (array.level == "raid10" ? 2 : 1);
 }
 
 bool is_redundant(const Array &array) {
@@ -162,6 +168,30 @@ bool is_broken(const Array &array) {
 
 bool is_degraded(const Array &array) {
     return count_members(array, Role::in_sync) < array.raid_devices;
+}
+
+bool has_device(const State &state, const Member &member) {
+    const Disk *disk = attached_disk(state, member.letter);
+    return disk != nullptr && disk->serial == member.serial;
+}
+
+bool is_failed(const State &state, const Array &array) {
+    if (is_redundant(array))
+        return is_broken(array);
+    return is_broken(array) ||
+           std::any_of(array.members.begin(), array.members.end(),
+                       [&state](const Member &member) { return !has_device(state, member); });
+}
+
+bool beginning_is_readable(const State &state, const Array &array) {
+    if (array.inactive)
+        return false;
+    if (is_redundant(array) && !is_broken(array))
+        return true;
+    const auto readable = [&](int place) {
+        return alive(array, place) && has_device(state, *member_at(array, place));
+    };
+    return readable(0) || (array.level == "raid10" && readable(1));
 }
 
 Refusal fail_member(State &state, Array &array, const std::string &letter, int partition) {

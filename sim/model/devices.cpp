@@ -2,39 +2,55 @@
 
 #include "model/arrays.hpp"
 #include "model/disks.hpp"
+#include "model/volumes.hpp"
 
-#include <algorithm>
 #include <fmt/format.h>
 
 namespace zavsim {
 
 namespace {
 
-void add_disk(std::vector<Node> &nodes, const Disk &disk) {
+void add_disk(std::vector<Node> &nodes, const Disk &disk, double now) {
     const std::string kernel_name = "sd" + disk.letter;
     const std::string own_name = fmt::format("/dev/sata/disk{}", disk.slot);
-    nodes.push_back({"/dev/" + kernel_name, {}, disk.kib * 1024, disk.serial});
-    nodes.push_back({own_name, "../" + kernel_name, 0, 0});
+    nodes.push_back({"/dev/" + kernel_name, {}, disk.kib * 1024, disk.serial, disk.label_id});
+    nodes.push_back({own_name, "../" + kernel_name, 0, 0, 0});
+    if (disk.settles > now)
+        return;
     for (const Partition &partition : disk.partitions) {
         nodes.push_back({fmt::format("/dev/{}{}", kernel_name, partition.number),
                          {},
                          partition.kib * 1024,
-                         disk.serial});
+                         disk.serial,
+                         0});
         nodes.push_back({fmt::format("{}p{}", own_name, partition.number),
-                         fmt::format("../{}{}", kernel_name, partition.number), 0, 0});
+                         fmt::format("../{}{}", kernel_name, partition.number), 0, 0, 0});
     }
 }
 
 void add_array(std::vector<Node> &nodes, const Array &array) {
     const std::string kernel_name = fmt::format("md{}", array.minor);
-    nodes.push_back({"/dev/" + kernel_name, {}, array_kib(array) * 1024, 0});
-    nodes.push_back(
-        {fmt::format("/dev/swraid/disk{}p1", array.minor + 1), "../" + kernel_name, 0, 0});
-    nodes.push_back({"/dev/md/" + array.name, "../" + kernel_name, 0, 0});
+    nodes.push_back({"/dev/" + kernel_name, {}, array_kib(array) * 1024, 0, 0});
+    if (const std::string link = array_link(array.minor); !link.empty())
+        nodes.push_back({"/dev/" + link, "../" + kernel_name, 0, 0, 0});
+    nodes.push_back({"/dev/md/" + array.name, "../" + kernel_name, 0, 0, 0});
 }
 
-bool digits_follow(const std::string &name, std::size_t at) {
-    return at < name.size() && name.find_first_not_of("0123456789", at) == std::string::npos;
+void add_volume(std::vector<Node> &nodes, const Group &group, const Volume &volume) {
+    const std::string kernel_name = fmt::format("dm-{}", volume.minor);
+    const auto extents = static_cast<std::uint64_t>(extents_of(volume));
+    nodes.push_back({"/dev/" + kernel_name, {}, extents * extent_kib * 1024, 0, 0});
+    nodes.push_back(
+        {fmt::format("/dev/{}/{}", group.name, volume.name), "../" + kernel_name, 0, 0, 0});
+    nodes.push_back({mapper_path(group, volume), "../" + kernel_name, 0, 0, 0});
+}
+
+// Where a name of its own has a hyphen device-mapper writes two.
+std::string doubled_hyphens(const std::string &name) {
+    std::string text;
+    for (const char c : name)
+        text += c == '-' ? std::string("--") : std::string(1, c);
+    return text;
 }
 
 } // namespace
@@ -43,20 +59,23 @@ std::vector<Node> device_nodes(const State &state) {
     std::vector<Node> nodes;
     for (const Disk &disk : state.disks)
         if (disk.attached)
-            add_disk(nodes, disk);
+            add_disk(nodes, disk, state.now);
     for (const Array &array : state.arrays)
         add_array(nodes, array);
+    for (const Group &group : state.groups)
+        for (const Volume &volume : group.volumes)
+            if (volume.active)
+                add_volume(nodes, group, volume);
     return nodes;
 }
 
-bool belongs_to_model(const std::string &directory, const std::string &name) {
-    if (directory == "/dev")
-        return parse_kernel_name(name).has_value() ||
-               (name.rfind("md", 0) == 0 && digits_follow(name, 2));
-    if (directory == "/dev/md")
-        return name.rfind("MD", 0) == 0 && digits_follow(name, 2);
-    return name.rfind("disk", 0) == 0 &&
-           name.find_first_not_of("0123456789p", 4) == std::string::npos;
+std::string array_link(int minor) {
+    return minor < 100 ? fmt::format("swraid/disk{}p1", minor + 1) : "";
+}
+
+std::string mapper_path(const Group &group, const Volume &volume) {
+    return fmt::format("/dev/mapper/{}-{}", doubled_hyphens(group.name),
+                       doubled_hyphens(volume.name));
 }
 
 } // namespace zavsim

@@ -11,14 +11,18 @@ namespace zavsim {
 
 struct Node {
     std::string path;
-    std::string target;      // of a link; empty for a node
-    std::uint64_t bytes = 0; // of a node
-    int serial = 0;          // of the disk that it belongs to; 0 for an array
+    std::string target;         // of a link; empty for a node
+    std::uint64_t bytes = 0;    // of a node
+    int serial = 0;             // of the disk that it belongs to; 0 for an array
+    std::uint32_t label_id = 0; // of a whole disk
 };
 
 std::vector<Node> device_nodes(const State &state);
 
-// Whether a name in that directory is the model's to make and to remove.
-bool belongs_to_model(const std::string &directory, const std::string &name);
+// The link below /dev that the appliance's rules give an array; none for numbers from the top.
+std::string array_link(int minor);
+
+// The name by which device-mapper knows a volume.
+std::string mapper_path(const Group &group, const Volume &volume);
 
 } // namespace zavsim

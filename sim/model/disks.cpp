@@ -87,8 +87,12 @@ Disk blank_disk(State &state, int slot) {
 }
 
 void attach(State &state, Disk &disk) {
-    if (!disk.attached)
+    if (!disk.attached) {
         disk.letter = free_letter(state);
+        if (disk.table_wiped)
+            disk.partitions.clear();
+        disk.table_wiped = false;
+    }
     disk.attached = true;
     detach_host(state, disk.host);
     state.scsi_hosts.push_back(disk.host);

@@ -12,6 +12,9 @@ const Disk *find_disk(const State &state, int slot);
 Partition *find_partition(Disk &disk, int number);
 const Partition *find_partition(const Disk &disk, int number);
 
+// Low half of the label's identifier, by which the appliance knows its own disks.
+constexpr std::uint32_t disk_mark = 0x104d;
+
 // A disk with nothing on it, in that slot, under the first free kernel name.
 Disk blank_disk(State &state, int slot);
 

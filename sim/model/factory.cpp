@@ -2,6 +2,7 @@
 
 #include "model/arrays.hpp"
 #include "model/disks.hpp"
+#include "model/volumes.hpp"
 
 #include <array>
 #include <fmt/format.h>
@@ -24,8 +25,8 @@ struct Level {
 };
 
 constexpr std::array<Level, 6> levels = {{{"raid0", 0, 2},
-                                          {"raid1", 1, 1},
-                                          {"linear", 9, 1},
+                                          {"raid1", 1, 2},
+                                          {"linear", 9, 2},
                                           {"raid5", 5, 3},
                                           {"raid6", 6, 4},
                                           {"raid10", 10, 4}}};
@@ -84,10 +85,43 @@ void build_array(State &state, int partition, const std::string &level) {
 
 Disk new_disk(State &state, int slot) {
     Disk disk = blank_disk(state, slot);
-    for (int number = 1; number <= 3; ++number)
-        disk.partitions.push_back(
-            {number, partition_kib.at(static_cast<std::size_t>(number - 1)), std::nullopt});
+    disk.label_id = 0x3c920000U + static_cast<std::uint32_t>(slot << 16) + disk_mark;
+    std::uint64_t start = 2048;
+    for (int number = 1; number <= 3; ++number) {
+        const std::uint64_t kib = partition_kib.at(static_cast<std::size_t>(number - 1));
+        disk.partitions.push_back({number, start, kib, std::nullopt});
+        start += kib * 2;
+    }
     return disk;
+}
+
+struct FactoryVolume {
+    const char *name;
+    int extents;
+};
+struct FactoryGroup {
+    const char *name;
+    int array;
+    std::array<FactoryVolume, 2> volumes;
+};
+
+// The data group's come first under device-mapper.
+constexpr std::array<FactoryGroup, 2> factory_groups = {
+    {{"DataVG1", 1, {{{"LogVol1", 32}, {"LogVol2", 16}}}},
+     {"PrimaryOSVG", 0, {{{"LogVol1", 8}, {"LogVol2", 4}}}}}};
+
+void build_group(State &state, const FactoryGroup &plan) {
+    const Place place = place_of_array(*find_array(state, plan.array));
+    create_pv(state, place, place.node);
+    create_group(state, plan.name, *find_pv(state, place.ground), place.node);
+    Group &group = *find_group(state, plan.name);
+    for (const FactoryVolume &volume : plan.volumes) {
+        create_volume(state, group, volume.name, volume.extents);
+        Volume &made = group.volumes.back();
+        made.created = find_array(state, plan.array)->created + 60;
+        make_file_system(made);
+        made.mount_point = usual_mount_point(plan.name, volume.name);
+    }
 }
 
 } // namespace
@@ -121,7 +155,7 @@ std::string level_problem(const std::string &model, const std::string &level) {
     const int disks = identity_of(model).disks;
     if (level.empty() || disks >= level_of(level).least_disks)
         return {};
-    if (disks == 0)
+    if (disks < 2)
         return fmt::format("model {} has no software array, --level does not apply", model);
     return fmt::format("{} needs {} disks, model {} has {}", level, level_of(level).least_disks,
                        model, disks);
@@ -139,6 +173,7 @@ State new_appliance(const Wishes &wishes) {
     state.model = wishes.model;
     state.current_tools = wishes.current_tools;
     state.time_scale = wishes.time_scale;
+    state.hosts_below_ata = wishes.hosts_below_ata;
     const int disks = identity_of(wishes.model).disks;
     for (int slot = 1; slot <= disks; ++slot)
         state.disks.push_back(new_disk(state, slot));
@@ -146,13 +181,16 @@ State new_appliance(const Wishes &wishes) {
         state.scsi_hosts.push_back(disk.host);
     state.scsi_hosts.push_back(optical_host);
     const std::string level = wishes.level.empty() ? usual_level(wishes.model) : wishes.level;
+    state.data_level = level;
     state.rebuild_kib_per_second =
         static_cast<double>(component_of(2, level)) / data_rebuild_seconds;
-    if (disks == 0)
+    if (disks < 2)
         return state;
     build_array(state, 1, "raid1");
     build_array(state, 2, level);
     build_array(state, 3, "raid1");
+    for (const FactoryGroup &group : factory_groups)
+        build_group(state, group);
     return state;
 }
 

@@ -18,6 +18,7 @@ struct Wishes {
     std::string level; // of the data array; empty for the model's usual one
     bool current_tools = false;
     double time_scale = 1;
+    bool hosts_below_ata = false;
 };
 
 std::vector<std::string> model_names();

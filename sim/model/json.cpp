@@ -29,20 +29,29 @@ NLOHMANN_JSON_SERIALIZE_ENUM(SyncKind, {{SyncKind::none, "none"},
                                         {SyncKind::repair, "repair"},
                                         {SyncKind::check, "check"}})
 NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(Superblock, uuid, number)
-NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(Partition, number, kib, superblock)
+NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(Partition, number, start, kib, superblock)
 NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(Disk, slot, host, letter, serial, inserted, attached, failing,
-                                   kib, partitions)
+                                   kib, label_id, partitions, table_wiped, settles)
 NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(Member, slot, serial, letter, partition, number, raid_device,
                                    role)
 NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(Sync, kind, order, started, running, pending, done_kib)
 NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(Array, minor, name, level, metadata, raid_devices, chunk_kib,
                                    component_kib, uuid, created, updated, events, bitmap, dirty,
                                    inactive, auto_read_only, sync, members)
+NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(Ground, array, serial, partition)
+NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(PhysicalVolume, id, ground, group, sectors, first_sector,
+                                   extents)
+NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(Segment, pv, first, extents)
+NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(FileSystem, kib, reserved_kib, used_kib)
+NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(Volume, name, id, created, active, minor, segments, file_system,
+                                   mount_point, busy)
+NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(Group, name, id, seqno, volumes)
 NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(ToolFault, tool, hangs, prints, exits, missing)
 NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(Event, at, sentence)
-NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(State, model, current_tools, time_scale, real_start, now,
-                                   rebuild_kib_per_second, next_serial, next_sync_order, disks,
-                                   arrays, faults, scenario, scsi_hosts, notes)
+NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(State, model, data_level, current_tools, hosts_below_ata,
+                                   time_scale, real_start, now, rebuild_kib_per_second, next_serial,
+                                   next_sync_order, next_id, disks, arrays, stopped,
+                                   physical_volumes, groups, faults, scenario, scsi_hosts, notes)
 
 std::string to_text(const State &state) {
     // A garbled tool text may hold any bytes.

@@ -110,17 +110,63 @@ Sentence about_numbered(const std::vector<Word> &words, const std::array<Verb, C
 }
 
 Sentence about_disk(const std::vector<Word> &words) {
-    static constexpr std::array<Verb, 4> verbs = {{{"fails", Action::Kind::disk_fails},
+    static constexpr std::array<Verb, 6> verbs = {{{"fails", Action::Kind::disk_fails},
                                                    {"vanishes", Action::Kind::disk_vanishes},
                                                    {"appears", Action::Kind::disk_appears},
-                                                   {"joins", Action::Kind::disk_joins}}};
-    return about_numbered(words, verbs, "fails, vanishes, appears or joins");
+                                                   {"joins", Action::Kind::disk_joins},
+                                                   {"detaches", Action::Kind::disk_detaches},
+                                                   {"attaches", Action::Kind::disk_attaches}}};
+    return about_numbered(words, verbs, "fails, vanishes, appears, joins, detaches or attaches");
 }
 
 Sentence about_array(const std::vector<Word> &words) {
-    static constexpr std::array<Verb, 2> verbs = {
-        {{"checks", Action::Kind::array_checks}, {"repairs", Action::Kind::array_repairs}}};
-    return about_numbered(words, verbs, "checks or repairs");
+    static constexpr std::array<Verb, 3> verbs = {{{"checks", Action::Kind::array_checks},
+                                                   {"repairs", Action::Kind::array_repairs},
+                                                   {"stops", Action::Kind::array_stops}}};
+    return about_numbered(words, verbs, "checks, repairs or stops");
+}
+
+// "1-2": the second volume of the first data group; group 0 is the system's.
+bool read_volume_number(const std::string &text, Action &action) {
+    const std::size_t hyphen = std::min(text.find('-'), text.size());
+    const auto group = whole_number(text.substr(0, hyphen), 0, 99);
+    const auto number = whole_number(hyphen == text.size() ? "" : text.substr(hyphen + 1), 1, 99);
+    action.group = group.value_or(0);
+    action.number = number.value_or(0);
+    return group && number;
+}
+
+std::optional<int> percentage(const std::string &text) {
+    return text.empty() || text.back() != '%'
+               ? std::nullopt
+               : whole_number(text.substr(0, text.size() - 1), 0, 100);
+}
+
+Sentence volume_state(Action action, const std::string &verb, const std::string &object) {
+    static constexpr std::array<Verb, 4> states = {{{"active", Action::Kind::volume_is_active},
+                                                    {"inactive", Action::Kind::volume_is_inactive},
+                                                    {"busy", Action::Kind::volume_is_busy},
+                                                    {"idle", Action::Kind::volume_is_idle}}};
+    for (const Verb &each : states)
+        if (verb == "is" && object == each.word) {
+            action.kind = each.kind;
+            return {action, {}};
+        }
+    if (verb != "fills" || !percentage(object))
+        return wrong(fmt::format("volume {}-{} fills N% (0 to 100), is active, is inactive, "
+                                 "is busy or is idle",
+                                 action.group, action.number));
+    action.kind = Action::Kind::volume_fills;
+    action.percent = *percentage(object);
+    return {action, {}};
+}
+
+Sentence about_volume(const std::vector<Word> &words) {
+    Action action;
+    if (words.size() < 2 || !read_volume_number(words[1].text, action))
+        return wrong("volume wants group and volume, such as 1-2 (group 0 is the system's)");
+    return words.size() == 4 ? volume_state(action, words[2].text, words[3].text)
+                             : volume_state(action, {}, {});
 }
 
 bool known(const std::string &tool) {
@@ -166,9 +212,11 @@ Sentence from_words(const std::vector<Word> &words) {
         return about_disk(words);
     if (noun == "array")
         return about_array(words);
+    if (noun == "volume")
+        return about_volume(words);
     if (noun == "tool")
         return about_tool(words);
-    return wrong("a sentence begins with disk, array or tool");
+    return wrong("a sentence begins with disk, array, volume or tool");
 }
 
 // One line of a scenario: nothing, or "at TIME SENTENCE".
@@ -202,7 +250,11 @@ std::string quoted(const std::string &word) {
 } // namespace
 
 const std::vector<std::string> &known_tools() {
-    static const std::vector<std::string> tools = {"mdadm", "smartctl", "mknod"};
+    static const std::vector<std::string> tools = {
+        "mdadm",     "smartctl",  "mknod",    "vgs",      "lvs",       "pvs",         "vgdisplay",
+        "lvdisplay", "pvdisplay", "vgcreate", "vgextend", "vgremove",  "vgcfgbackup", "vgchange",
+        "lvcreate",  "lvremove",  "lvchange", "pvcreate", "pvremove",  "udevinfo",    "sfdisk",
+        "dd",        "df",        "mount",    "umount",   "mkfs.ext4", "hbqSetup.sh"};
     return tools;
 }
 

@@ -17,6 +17,7 @@ struct Superblock {
 
 struct Partition {
     int number = 0;
+    std::uint64_t start = 0; // first sector on the disk
     std::uint64_t kib = 0;
     std::optional<Superblock> superblock;
 };
@@ -30,7 +31,10 @@ struct Disk {
     bool attached = false; // known to the kernel
     bool failing = false;  // health check fails
     std::uint64_t kib = 0;
-    std::vector<Partition> partitions;
+    std::uint32_t label_id = 0;        // bytes 440 to 443, lowest first; the mark is the first two
+    std::vector<Partition> partitions; // as the kernel knows them
+    bool table_wiped = false;          // the table is gone, which the kernel has not noticed
+    double settles = 0; // until this time udev reads the table again: no partition has a node
 };
 
 enum class Role { in_sync, rebuilding, spare, faulty };
@@ -77,6 +81,53 @@ struct Array {
     std::vector<Member> members; // in the kernel's order, newest first
 };
 
+// What a physical volume lies on: an array by its identifier, else a disk or a partition of one.
+struct Ground {
+    std::string array;
+    int serial = 0;
+    int partition = 0; // 0 for the whole disk
+};
+
+struct PhysicalVolume {
+    std::string id;
+    Ground ground;
+    std::string group; // empty: belongs to none
+    std::uint64_t sectors = 0;
+    std::uint64_t first_sector = 0; // of the first extent
+    int extents = 0;
+};
+
+struct Segment {
+    std::string pv; // by identifier
+    int first = 0;
+    int extents = 0;
+};
+
+struct FileSystem {
+    std::uint64_t kib = 0;
+    std::uint64_t reserved_kib = 0; // not for ordinary users
+    std::uint64_t used_kib = 0;
+};
+
+struct Volume {
+    std::string name;
+    std::string id;
+    double created = 0;
+    bool active = false;
+    int minor = -1; // of the device-mapper node while active
+    std::vector<Segment> segments;
+    std::optional<FileSystem> file_system;
+    std::string mount_point; // empty: not mounted
+    bool busy = false;       // somebody works in the mounted file system
+};
+
+struct Group {
+    std::string name;
+    std::string id;
+    int seqno = 1;
+    std::vector<Volume> volumes;
+};
+
 struct ToolFault {
     std::string tool;
     double hangs = 0; // appliance seconds, each run
@@ -92,8 +143,16 @@ struct Action {
         disk_vanishes,
         disk_appears,
         disk_joins,
+        disk_detaches,
+        disk_attaches,
         array_checks,
         array_repairs,
+        array_stops,
+        volume_fills,
+        volume_is_active,
+        volume_is_inactive,
+        volume_is_busy,
+        volume_is_idle,
         tool_hangs,
         tool_prints,
         tool_exits,
@@ -101,7 +160,9 @@ struct Action {
         tool_works
     };
     Kind kind = Kind::disk_fails;
-    int number = 0; // disk or array, counted from 1
+    int number = 0; // disk, array or volume, counted from 1
+    int group = 0;  // of the volume; 0 is the system's
+    int percent = 0;
     std::string tool;
     double seconds = 0;
     std::string text;
@@ -115,15 +176,21 @@ struct Event {
 
 struct State {
     std::string model;
+    std::string data_level; // of the data array that the setup script makes
     bool current_tools = false;
+    bool hosts_below_ata = false; // in sysfs
     double time_scale = 1;
     double real_start = 0; // monotonic clock of the machine when the appliance started
     double now = 0;        // appliance time, seconds since start; the state holds for this moment
     double rebuild_kib_per_second = 0;
     int next_serial = 1;
     int next_sync_order = 1;
-    std::vector<Disk> disks;   // in the order in which the kernel found them
-    std::vector<Array> arrays; // newest first
+    int next_id = 1;            // of what gets an identifier while the appliance runs
+    std::vector<Disk> disks;    // in the order in which the kernel found them
+    std::vector<Array> arrays;  // newest first
+    std::vector<Array> stopped; // known by what they left on their members
+    std::vector<PhysicalVolume> physical_volumes; // a group's in the order in which it got them
+    std::vector<Group> groups;                    // in the order in which they were made
     std::vector<ToolFault> faults;
     std::vector<Event> scenario; // what is still to come, soonest first
     std::vector<int> scsi_hosts; // hosts with a device, in the order in which the kernel found them

@@ -33,6 +33,9 @@ std::string scsi_text(const State &state);
 // " (95.00 MiB 99.61 MB)"; empty for small sizes.
 std::string human_size(std::uint64_t kib);
 
+// The appliance starts on Monday 14 March 2011, 08:00 UTC.
+constexpr double start_of_time = 1300089600;
+
 // As ctime prints it, without the line feed; the appliance's clock is a fixed one, so that the
 // same run prints the same text.
 std::string date_text(double appliance_time);

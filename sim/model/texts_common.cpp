@@ -8,9 +8,6 @@ namespace zavsim {
 
 namespace {
 
-// Monday 14 March 2011, 08:00 UTC.
-constexpr double start_of_time = 1300089600;
-
 // mdadm's rounding: to the nearest hundredth, in integers.
 std::string both_units(std::uint64_t bytes, int shift, std::uint64_t decimal, char letter) {
     const std::uint64_t binary = ((bytes * 200 >> shift) + 1) / 2;

@@ -41,18 +41,13 @@ std::string sync_words(const Array &array) {
     return words.at(sync.kind);
 }
 
-bool has_node(const State &state, const Member &member) {
-    const Disk *disk = attached_disk(state, member.letter);
-    return disk != nullptr && disk->serial == member.serial;
-}
-
 // The current mdadm judges by the members whose nodes it finds, whatever the kernel still holds.
 bool looks_broken(const State &state, const Array &array) {
     if (!state.current_tools)
-        return is_broken(array);
+        return is_failed(state, array);
     Array found = array;
     for (Member &member : found.members)
-        if (!has_node(state, member))
+        if (!has_device(state, member))
             member.role = Role::faulty;
     return is_broken(found);
 }
@@ -135,7 +130,7 @@ void identity(Sheet &sheet, const Array &array) {
 }
 
 std::string device_path(const State &state, const Member &member) {
-    if (!has_node(state, member))
+    if (!has_device(state, member))
         return state.current_tools ? "   missing" : "";
     return fmt::format("   /dev/sd{}{}", member.letter, member.partition);
 }

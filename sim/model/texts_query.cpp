@@ -1,6 +1,7 @@
 #include "model/arrays.hpp"
 #include "model/texts.hpp"
 
+#include <algorithm>
 #include <fmt/format.h>
 
 namespace zavsim {
@@ -13,6 +14,15 @@ std::string old_superblock_text(const State &state, const Array &array) {
                                                   : fmt::format("level={} num-devices={} ",
                                                                 array.level, array.raid_devices);
     return fmt::format("ARRAY /dev/md{} {}UUID={}\n", array.minor, level, array.uuid);
+}
+
+// A partition that the array no longer holds is a mismatch, however good its data.
+const char *activity(const State &state, const Array &array, const Disk &disk, int partition) {
+    const bool runs = std::any_of(state.arrays.begin(), state.arrays.end(),
+                                  [&array](const Array &each) { return each.uuid == array.uuid; });
+    const Member *member = find_member(array, disk.letter, partition);
+    const bool held = member != nullptr && member->serial == disk.serial;
+    return !runs ? "undetected" : held ? "active" : "mismatch";
 }
 
 } // namespace
@@ -41,13 +51,11 @@ std::string query_text(const State &state, const Disk &disk, const Partition *pa
     const Array *array = array_of_uuid(state, partition->superblock->uuid);
     if (array == nullptr)
         return text;
-    // A partition that the array no longer holds is a mismatch, however good its data.
-    const Member *member = find_member(*array, disk.letter, partition->number);
-    const bool held = member != nullptr && member->serial == disk.serial;
     return text + fmt::format("{}: device {} in {} device {} {} /dev/md{}.  Use mdadm --examine "
                               "for more detail.\n",
                               shown_name, partition->superblock->number, array->raid_devices,
-                              held ? "active" : "mismatch", array->level, array->minor);
+                              activity(state, *array, disk, partition->number), array->level,
+                              array->minor);
 }
 
 } // namespace zavsim

@@ -1,5 +1,6 @@
 #include "root/files.hpp"
 
+#include <array>
 #include <cerrno>
 #include <fcntl.h>
 #include <fstream>
@@ -58,6 +59,15 @@ void make_sparse(const fs::path &path, std::uint64_t bytes) {
     const Descriptor file(open(path.c_str(), O_RDWR | O_CREAT | O_CLOEXEC, 0660));
     if (file.get() < 0 || ftruncate(file.get(), static_cast<off_t>(bytes)) != 0)
         throw std::system_error(errno, std::generic_category(), path);
+}
+
+void write_label_id(const fs::path &disk, std::uint32_t label_id) {
+    const Descriptor file(open(disk.c_str(), O_WRONLY | O_CLOEXEC));
+    std::array<unsigned char, 4> bytes{};
+    for (std::size_t i = 0; i < bytes.size(); ++i)
+        bytes.at(i) = static_cast<unsigned char>(label_id >> (8 * i));
+    if (file.get() < 0 || pwrite(file.get(), bytes.data(), bytes.size(), 440) != 4)
+        throw std::system_error(errno, std::generic_category(), disk);
 }
 
 } // namespace zavsim

@@ -24,6 +24,9 @@ void point_link(const std::filesystem::path &link, const std::string &target);
 // A file of that size that occupies nothing.
 void make_sparse(const std::filesystem::path &path, std::uint64_t bytes);
 
+// The identifier of a disk's label, at its place on the disk.
+void write_label_id(const std::filesystem::path &disk, std::uint32_t label_id);
+
 // An open file that is closed with its owner.
 class Descriptor {
   public:

@@ -123,7 +123,6 @@ void populate_appliance(const Options &options) {
     write_text("/etc/Kiru/raidtype",
                chosen(options.raidtype, raidtype_line(options.model, options.level)));
     write_text("/etc/sysconfig/clock", "ZONE=\"Asia/Tokyo\"\nUTC=true\n");
-    write_text("/etc/mtab", "");
     write_text("/etc/fstab", "");
     write_text("/dev/nvram", bios_settings());
     for (const char *queue : {"/dev/zavevent0", "/dev/zavledevent"})

@@ -3,11 +3,13 @@
 #include "launcher/sandbox.hpp"
 #include "model/devices.hpp"
 #include "model/texts.hpp"
+#include "model/texts_volumes.hpp"
 #include "root/files.hpp"
 #include "tools/tools.hpp"
 
 #include <chrono>
 #include <filesystem>
+#include <fmt/format.h>
 #include <map>
 #include <nlohmann/json.hpp>
 #include <set>
@@ -21,12 +23,28 @@ namespace {
 // A detached disk keeps its content in its bay until it is attached again.
 const fs::path bays = "/dev/.bays";
 
-void remove_stale_links(const std::set<std::string> &wanted) {
-    for (const std::string directory : {"/dev/sata", "/dev/swraid", "/dev/md"})
-        for (const auto &entry : fs::directory_iterator(directory))
-            if (belongs_to_model(directory, entry.path().filename()) &&
-                wanted.count(entry.path()) == 0)
-                fs::remove(entry.path());
+const std::set<std::string> kept_directories = {"/dev", "/dev/sata", "/dev/swraid", "/dev/md",
+                                                "/dev/mapper"};
+
+using Names = std::set<std::string>;
+
+// Links that another turn made and that are wanted no more. A volume's stand in a directory of
+// their group, which goes with the last.
+void remove_stale_links(const Names &wanted) {
+    const fs::path links_file = place::run + "/links";
+    const auto text = read_text(links_file);
+    const Names present = text ? nlohmann::json::parse(*text).get<Names>() : Names{};
+    if (present == wanted)
+        return;
+    for (const std::string &link : present) {
+        std::error_code in_use;
+        if (wanted.count(link) != 0)
+            continue;
+        fs::remove(link, in_use);
+        if (kept_directories.count(fs::path(link).parent_path()) == 0)
+            fs::remove(fs::path(link).parent_path(), in_use);
+    }
+    write_text(links_file, nlohmann::json(wanted).dump());
 }
 
 fs::path bay_of(const std::string &name, int serial) {
@@ -64,13 +82,16 @@ void make_node(const Node &node) {
     std::error_code error;
     if (node.serial != 0 && !fs::exists(node.path))
         fs::rename(bay_of(name, node.serial), node.path, error);
-    if (!fs::exists(node.path))
-        make_sparse(node.path, node.bytes);
+    if (fs::exists(node.path))
+        return;
+    make_sparse(node.path, node.bytes);
+    if (node.label_id != 0)
+        write_label_id(node.path, node.label_id);
 }
 
 void publish_devices(const State &state) {
     const std::vector<Node> nodes = device_nodes(state);
-    std::set<std::string> links;
+    Names links;
     Owners owners;
     for (const Node &node : nodes)
         if (node.target.empty())
@@ -91,10 +112,27 @@ void publish_devices(const State &state) {
             point_link(node.path, node.target);
 }
 
-// The controller has six ports, with a disk or without.
-void publish_ports() {
+// The controller has six ports, with a disk or without. Newer kernels have a directory for each.
+void publish_ports(const State &state) {
     for (int host = 0; host < 6; ++host)
-        fs::create_directories("/sys/devices/pci0000:00/0000:00:1f.2/host" + std::to_string(host));
+        fs::create_directories(
+            fmt::format("/sys/devices/pci0000:00/0000:00:1f.2/{}host{}",
+                        state.hosts_below_ata ? fmt::format("ata{}/", host + 1) : "", host));
+}
+
+// A program may write its own mtab; it is replaced when a mount changes.
+void publish_mounts(const State &state) {
+    for (const Group &group : state.groups)
+        for (const Volume &volume : group.volumes)
+            if (!volume.mount_point.empty())
+                fs::create_directories(volume.mount_point);
+    const fs::path shown = place::run + "/mtab";
+    const std::string mtab = mtab_text(state);
+    if (read_text(shown) != mtab) {
+        write_text(shown, mtab);
+        write_text("/etc/mtab", mtab);
+    }
+    write_text(place::run + "/file-systems", file_systems_text(state));
 }
 
 bool is_missing(const State &state, const std::string &tool) {
@@ -138,7 +176,8 @@ void publish(const State &state, const std::string &taken_command) {
     write_text("/proc/mdstat", mdstat_text(state));
     publish_scsi(scsi_text(state), taken_command);
     publish_devices(state);
-    publish_ports();
+    publish_ports(state);
+    publish_mounts(state);
     publish_tools(state);
 }
 

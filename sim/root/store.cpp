@@ -64,8 +64,8 @@ void Turn::commit() {
 }
 
 void start_model(const Options &options) {
-    State state = new_appliance(
-        {options.model, options.level, options.tools == "current", options.time_scale});
+    State state = new_appliance({options.model, options.level, options.tools == "current",
+                                 options.time_scale, options.hosts == "ata"});
     state.real_start = machine_seconds();
     state.scenario = parse_scenario(options.scenario, options.scenario_file).events;
     write_text(state_file, to_text(state));

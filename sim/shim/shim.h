@@ -1,4 +1,5 @@
-/* The preloaded part of the simulated appliance: time that runs faster, and driver devices. */
+/* The preloaded part of the simulated appliance: time that runs faster, driver
+ * devices, and the numbers of mounted volumes. */
 #ifndef ZAVSIM_SHIM_H
 #define ZAVSIM_SHIM_H
 

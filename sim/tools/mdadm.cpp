@@ -1,7 +1,9 @@
 // mdadm: --detail ARRAY, --query --examine --scan DEVICE, --misc --query DEVICE, and manage mode
-// ARRAY -f|-r|-a DEVICE...
+// ARRAY -f|-r|-a DEVICE..., --stop ARRAY, --zero-superblock DEVICE; --create is in
+// mdadm_create.cpp.
 #include "model/advance.hpp"
 #include "model/arrays.hpp"
+#include "model/contents.hpp"
 #include "model/disks.hpp"
 #include "model/texts.hpp"
 #include "root/store.hpp"
@@ -204,12 +206,60 @@ int manage(State &state, const std::vector<std::string> &words) {
     return status;
 }
 
+int stop(Turn &turn, const std::vector<std::string> &paths) {
+    for (const std::string &path : paths) {
+        const auto minor = array_behind(path);
+        const Refusal refusal = minor ? stop_array(turn.state(), *minor) : Refusal::no_such_device;
+        if (refusal == Refusal::no_such_device)
+            return complain(fmt::format("error opening {}: No such file or directory", path));
+        if (refusal == Refusal::busy)
+            return complain(fmt::format("Cannot get exclusive access to {}:Perhaps a running "
+                                        "process, mounted filesystem or active volume group?",
+                                        path));
+        advance(turn.state(), turn.state().now);
+        turn.commit();
+        fmt::print(stderr, "mdadm: stopped {}\n", path);
+    }
+    return 0;
+}
+
+// A device that an array holds cannot be opened for it.
+int zero_superblock(State &state, const std::string &path) {
+    const auto place = device_behind(path);
+    Disk *disk = place ? attached_disk(state, place->letter) : nullptr;
+    const bool held =
+        std::any_of(state.arrays.begin(), state.arrays.end(), [&place](const Array &array) {
+            return place && find_member(array, place->letter, place->partition) != nullptr;
+        });
+    if (disk == nullptr || held) {
+        complain(fmt::format("Couldn't open {} for write - not zeroing", path));
+        return kernel_refusal;
+    }
+    Partition *partition = find_partition(*disk, place->partition);
+    if (partition != nullptr && partition->superblock)
+        partition->superblock.reset();
+    else
+        complain(fmt::format("Unrecognised md component device - {}", path));
+    forget_lost(state);
+    return 0;
+}
+
+int zero_superblocks(Turn &turn, const std::vector<std::string> &paths) {
+    int status = 0;
+    for (const std::string &path : paths)
+        status = std::max(status, zero_superblock(turn.state(), path));
+    turn.commit();
+    return status;
+}
+
 } // namespace
 
 int run_mdadm(const std::vector<std::string> &words) {
     const std::vector<std::string> devices = devices_of(words);
     if (devices.empty())
         return complain("An md device must be given in this mode");
+    if (has(words, {"--create", "-C"}))
+        return run_mdadm_create(words);
     Turn turn;
     State &state = turn.state();
     if (has(words, {"--detail", "-D"}))
@@ -218,6 +268,10 @@ int run_mdadm(const std::vector<std::string> &words) {
         return examine_scan(state, devices);
     if (has(words, {"--query", "-Q"}))
         return query(state, devices);
+    if (has(words, {"--zero-superblock"}))
+        return zero_superblocks(turn, devices);
+    if (has(words, {"--stop", "-S"}))
+        return stop(turn, devices);
     if (words.front().rfind('-', 0) == 0)
         return complain(fmt::format("{} is not simulated", words.front()));
     const int status = manage(state, words);

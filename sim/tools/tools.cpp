@@ -62,9 +62,34 @@ Present present_fault(const std::string &tool) {
 } // namespace
 
 const std::vector<Tool> &simulated_tools() {
-    static const std::vector<Tool> tools = {{"mdadm", "/usr/sbin/mdadm", run_mdadm},
-                                            {"smartctl", "/usr/sbin/smartctl", run_smartctl},
-                                            {"mknod", "/usr/bin/mknod", run_mknod}};
+    static const std::vector<Tool> tools = {
+        {"mdadm", "/usr/sbin/mdadm", run_mdadm},
+        {"smartctl", "/usr/sbin/smartctl", run_smartctl},
+        {"mknod", "/usr/bin/mknod", run_mknod},
+        {"vgs", "/usr/sbin/vgs", run_vgs},
+        {"lvs", "/usr/sbin/lvs", run_lvs},
+        {"pvs", "/usr/sbin/pvs", run_pvs},
+        {"vgdisplay", "/usr/sbin/vgdisplay", run_vgdisplay},
+        {"lvdisplay", "/usr/sbin/lvdisplay", run_lvdisplay},
+        {"pvdisplay", "/usr/sbin/pvdisplay", run_pvdisplay},
+        {"vgcfgbackup", "/usr/sbin/vgcfgbackup", run_vgcfgbackup},
+        {"pvcreate", "/usr/sbin/pvcreate", run_pvcreate},
+        {"pvremove", "/usr/sbin/pvremove", run_pvremove},
+        {"vgcreate", "/usr/sbin/vgcreate", run_vgcreate},
+        {"vgextend", "/usr/sbin/vgextend", run_vgextend},
+        {"vgremove", "/usr/sbin/vgremove", run_vgremove},
+        {"vgchange", "/usr/sbin/vgchange", run_vgchange},
+        {"lvcreate", "/usr/sbin/lvcreate", run_lvcreate},
+        {"lvremove", "/usr/sbin/lvremove", run_lvremove},
+        {"lvchange", "/usr/sbin/lvchange", run_lvchange},
+        {"udevinfo", "/usr/bin/udevinfo", run_udevinfo},
+        {"sfdisk", "/usr/sbin/sfdisk", run_sfdisk},
+        {"dd", "/usr/bin/dd", run_dd},
+        {"df", "/usr/bin/df", run_df},
+        {"mount", "/usr/bin/mount", run_mount},
+        {"umount", "/usr/bin/umount", run_umount},
+        {"mkfs.ext4", "/usr/sbin/mkfs.ext4", run_mkfs},
+        {"hbqSetup.sh", "/usr/bin/hbqSetup.sh", run_setup_script}};
     return tools;
 }
 

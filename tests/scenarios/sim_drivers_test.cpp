@@ -61,6 +61,27 @@ TEST_P(Shim, CountsAndTakesPrivateEvents) {
     EXPECT_EQ(run.out, "count ok 2\ntake ok 7\n");
 }
 
+std::string four_times(const std::string &line) {
+    return line + line + line + line;
+}
+
+TEST_P(Shim, GivesAMountedVolumesOwnNumbers) {
+    EXPECT_EQ(probe({"statfs", "/mnt/internal/data1-2"}).out, four_times("ok 56037 56023 51437\n"));
+    const Outcome run = on_appliance("zavsim act volume 1-2 fills 95%; mkdir "
+                                     "/mnt/internal/data1-2/deep; ln -s /mnt/internal /tmp/way; " +
+                                     GetParam() + " statfs /tmp/way/data1-2/deep");
+    EXPECT_EQ(run.out, four_times("ok 56037 7387 2801\n"));
+}
+
+TEST_P(Shim, GivesThePlainDirectorysNumbersOfAVolumeThatIsNotMounted) {
+    const std::string probe = GetParam() + " statfs ";
+    const Outcome run = on_appliance("cut -d ' ' -f 2 <<< \"$(" + probe + "/mnt)\" > /tmp/below; " +
+                                     "umount /mnt/internal/data1-2; cut -d ' ' -f 2 <<< \"$(" +
+                                     probe + "/mnt/internal/data1-2)\" | cmp - /tmp/below && " +
+                                     "grep -c 56037 /tmp/below; " + probe + "/no/such | head -n 1");
+    EXPECT_EQ(run.out, "0\nNo such file or directory 0 0 0\n");
+}
+
 TEST_P(Shim, IsNotThereInABareRoot) {
     const Outcome run = probe({"exclusive", "/dev/zavevent0"}, {"--bare"});
     EXPECT_EQ(run.out.rfind("first No such file or directory\n", 0), 0U) << run.out;

@@ -5,6 +5,7 @@
 #include <stdlib.h>
 #include <string.h>
 #include <sys/ioctl.h>
+#include <sys/vfs.h>
 #include <time.h>
 #include <unistd.h>
 
@@ -76,6 +77,25 @@ static void probe_private(void) {
     printf("take %s %d\n", verdict(taken), record[871]);
 }
 
+static void print_blocks(int result, unsigned long long blocks, unsigned long long free,
+                         unsigned long long available) {
+    printf("%s %llu %llu %llu\n", verdict(result), blocks, free, available);
+}
+
+static void probe_statfs(const char *path) {
+    struct statfs record = {0};
+    struct statfs64 record64 = {0};
+    int result = statfs(path, &record);
+    print_blocks(result, record.f_blocks, record.f_bfree, record.f_bavail);
+    result = statfs64(path, &record64);
+    print_blocks(result, record64.f_blocks, record64.f_bfree, record64.f_bavail);
+    const int fd = open(path, O_RDONLY | O_DIRECTORY);
+    result = fstatfs(fd, &record);
+    print_blocks(result, record.f_blocks, record.f_bfree, record.f_bavail);
+    result = fstatfs64(fd, &record64);
+    print_blocks(result, record64.f_blocks, record64.f_bfree, record64.f_bavail);
+}
+
 int main(int argc, char **argv) {
     const char *what = argc > 1 ? argv[1] : "";
     if (strcmp(what, "sleep") == 0)
@@ -84,6 +104,8 @@ int main(int argc, char **argv) {
         probe_exclusive(argv[2]);
     else if (strcmp(what, "queue") == 0 && argc == 4)
         probe_queue(argv[2], (size_t)atoi(argv[3]));
+    else if (strcmp(what, "statfs") == 0 && argc == 3)
+        probe_statfs(argv[2]);
     else if (strcmp(what, "private") == 0)
         probe_private();
     else

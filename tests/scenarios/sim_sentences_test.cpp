@@ -20,6 +20,20 @@ TEST(Sentences, SayWhatHappensToADisk) {
 TEST(Sentences, SayWhatHappensToAnArray) {
     EXPECT_EQ(parse_sentence("array 2 checks").action.kind, Action::Kind::array_checks);
     EXPECT_EQ(parse_sentence("array 2 repairs").action.kind, Action::Kind::array_repairs);
+    EXPECT_EQ(parse_sentence("array 2 stops").action.kind, Action::Kind::array_stops);
+}
+
+TEST(Sentences, SayWhatHappensToAVolume) {
+    const Action filled = parse_sentence("volume 1-2 fills 95%").action;
+    EXPECT_EQ(filled.kind, Action::Kind::volume_fills);
+    EXPECT_EQ(filled.group, 1);
+    EXPECT_EQ(filled.number, 2);
+    EXPECT_EQ(filled.percent, 95);
+    EXPECT_EQ(parse_sentence("volume 0-1 is active").action.kind, Action::Kind::volume_is_active);
+    EXPECT_EQ(parse_sentence("volume 0-1 is inactive").action.kind,
+              Action::Kind::volume_is_inactive);
+    EXPECT_EQ(parse_sentence("volume 0-1 is busy").action.kind, Action::Kind::volume_is_busy);
+    EXPECT_EQ(parse_sentence("volume 0-1 is idle").action.kind, Action::Kind::volume_is_idle);
 }
 
 TEST(Sentences, SayWhatHappensToATool) {
@@ -43,6 +57,18 @@ TEST(Sentences, RefuseWhatTheyDoNotMean) {
                              "disk 3 explodes",
                              "array 2 fails",
                              "array checks",
+                             "volume",
+                             "volume 1",
+                             "volume 1-",
+                             "volume 1-0 is busy",
+                             "volume -1 is busy",
+                             "volume 1-2",
+                             "volume 1-2 fills",
+                             "volume 1-2 fills 95",
+                             "volume 1-2 fills 101%",
+                             "volume 1-2 fills %",
+                             "volume 1-2 is full",
+                             "volume 1-2 is busy now",
                              "tool",
                              "tool mdadm",
                              "tool ls hangs 3s",

@@ -257,7 +257,8 @@ TEST(Acting, RefusesWhatCannotBe) {
     const Outcome run = on_appliance("zavsim act disk 3 sings; echo $?; zavsim act disk 3 appears; "
                                      "echo $?");
     EXPECT_EQ(run.out, "64\n1\n");
-    EXPECT_EQ(run.err, "zavsim: disk 3 fails, vanishes, appears or joins\n"
+    EXPECT_EQ(run.err, "zavsim: disk 3 fails, vanishes, appears, joins, detaches or "
+                       "attaches\n"
                        "zavsim: disk 3 is in its slot\n");
 }
 

@@ -3,6 +3,9 @@
 #include <cerrno>
 #include <cstdarg>
 #include <cstdio>
+#include <cstdlib>
+#include <cstring>
+#include <ctime>
 #include <dlfcn.h>
 #include <filesystem>
 #include <fstream>
@@ -20,6 +23,7 @@ namespace harness {
 
 namespace {
 
+bool record_is_ready = false; // memory is asked for before the record is made
 std::string log_ident;
 int log_options;
 int log_facility;
@@ -27,6 +31,11 @@ int log_facility;
 template <typename Function>
 Function *real(const char *name) {
     return reinterpret_cast<Function *>(dlsym(RTLD_NEXT, name));
+}
+
+void note_command(const char *command) {
+    record().commands.emplace_back(command);
+    record().steps.emplace_back(command);
 }
 
 } // namespace
@@ -40,15 +49,42 @@ std::ostream &operator<<(std::ostream &out, const LogRow &row) {
                << " priority " << row.priority << ": " << row.text;
 }
 
+Answer prints(const std::string &output) {
+    Answer answer;
+    answer.output = output;
+    return answer;
+}
+
+Answer exits(int status, int error) {
+    Answer answer;
+    answer.status = status;
+    answer.error = error;
+    return answer;
+}
+
+Answer no_start() {
+    Answer answer;
+    answer.starts = false;
+    return answer;
+}
+
+Answer ScriptedShell::answer(const std::string &command) const {
+    for (const auto &[part, answer] : rows_)
+        if (command.find(part) != std::string::npos)
+            return answer;
+    return {};
+}
+
 Record &record() {
     static Record the_record;
     return the_record;
 }
 
 // What tests put into the root. The bare root itself comes with the directories.
-constexpr const char *kWipedDirectories[] = {"/etc/Kiru",      "/proc/zav", "/proc/scsi",
-                                             "/sys/class",     "/dev/sata", "/dev/swraid",
-                                             "/dev/iscsiraid", "/scratch"};
+constexpr const char *kWipedDirectories[] = {"/etc/Kiru",      "/proc/zav",    "/proc/scsi",
+                                             "/sys/class",     "/dev/sata",    "/dev/swraid",
+                                             "/dev/iscsiraid", "/dev/DataVG1", "/dev/PrimaryOSVG",
+                                             "/sys/devices",   "/scratch"};
 constexpr const char *kWipedFiles[] = {"/proc/mdstat",
                                        "/dev/nvram",
                                        "/dev/mem",
@@ -81,6 +117,7 @@ Appliance::Appliance() {
             semctl(id, 0, IPC_RMID);
     }
     record() = {};
+    record_is_ready = true;
 }
 
 void Appliance::put(const std::string &path, const std::string &text) {
@@ -108,9 +145,18 @@ std::string Appliance::get(const std::string &path) {
     return text.str();
 }
 
+bool Appliance::exists(const std::string &path) {
+    return fs::exists(path);
+}
+
 void Appliance::model(const std::string &product, const std::string &raidtype) {
     put("/sys/class/dmi/id/product_name", product);
     put("/etc/Kiru/raidtype", raidtype);
+}
+
+int Appliance::semaphore_value(int key) {
+    const int id = real<int(key_t, int, int)>("semget")(key, 1, 0);
+    return id < 0 ? -1 : semctl(id, 0, GETVAL);
 }
 
 size_t Appliance::open_descriptors() {
@@ -144,19 +190,38 @@ std::ostream &operator<<(std::ostream &out, const zavDevice &dev) {
 extern "C" {
 
 int system(const char *command) {
-    harness::record().commands.emplace_back(command);
+    harness::note_command(command);
+    if (harness::record().shell) {
+        const harness::Answer answer = harness::record().shell->answer(command);
+        errno = answer.error;
+        return answer.starts ? answer.status << 8 : -1;
+    }
     if (harness::record().system_status)
         return *harness::record().system_status;
     return harness::real<int(const char *)>("system")(command);
 }
 
 FILE *popen(const char *command, const char *mode) {
-    harness::record().commands.emplace_back(command);
-    if (harness::record().popen_fails) {
+    harness::note_command(command);
+    const auto real_popen = harness::real<FILE *(const char *, const char *)>("popen");
+    harness::Answer answer;
+    if (harness::record().shell)
+        answer = harness::record().shell->answer(command);
+    if (harness::record().popen_fails || !answer.starts) {
         errno = EMFILE;
         return nullptr;
     }
-    return harness::real<FILE *(const char *, const char *)>("popen")(command, mode);
+    if (!harness::record().shell)
+        return real_popen(command, mode);
+    std::ofstream("/scratch/answer", std::ios::binary) << answer.output;
+    const std::string stand_in = "cat /scratch/answer; exit " + std::to_string(answer.status);
+    FILE *pipe = real_popen(stand_in.c_str(), mode);
+    if (pipe != nullptr) { // the next answer may be written before this one is read
+        const int first = fgetc(pipe);
+        if (first != EOF)
+            ungetc(first, pipe);
+    }
+    return pipe;
 }
 
 int pclose(FILE *pipe) {
@@ -166,6 +231,7 @@ int pclose(FILE *pipe) {
 
 unsigned sleep(unsigned seconds) {
     harness::record().sleeps.push_back(seconds);
+    harness::record().steps.push_back("sleep " + std::to_string(seconds));
     if (harness::record().during_sleep)
         harness::record().during_sleep(harness::record().sleeps.size());
     return 0;
@@ -173,6 +239,7 @@ unsigned sleep(unsigned seconds) {
 
 int usleep(useconds_t microseconds) {
     harness::record().short_sleeps.push_back(microseconds);
+    harness::record().steps.push_back("usleep " + std::to_string(microseconds));
     if (harness::record().during_short_sleep)
         harness::record().during_short_sleep();
     return 0;
@@ -202,6 +269,60 @@ int semget(key_t key, int semaphores, int flags) {
         return -1;
     }
     return harness::real<int(key_t, int, int)>("semget")(key, semaphores, flags);
+}
+
+int semop(int id, sembuf *operations, size_t count) {
+    if (harness::record().semop_fails && harness::record().semop_fails(operations[0].sem_op)) {
+        errno = EIDRM;
+        return -1;
+    }
+    return harness::real<int(int, sembuf *, size_t)>("semop")(id, operations, count);
+}
+
+time_t time(time_t *result) noexcept {
+    auto &times = harness::record().times;
+    timespec now = {};
+    clock_gettime(CLOCK_REALTIME, &now);
+    time_t answer = now.tv_sec;
+    if (!times.empty()) {
+        answer = times.front();
+        if (times.size() > 1)
+            times.erase(times.begin());
+        if (answer == -1)
+            errno = EFAULT;
+    }
+    if (result != nullptr)
+        *result = answer;
+    return answer;
+}
+
+int statfs(const char *path, struct statfs *answer) noexcept {
+    harness::record().measured = path;
+    if (!harness::record().file_system) {
+        errno = EACCES;
+        return -1;
+    }
+    *answer = *harness::record().file_system;
+    return 0;
+}
+
+// Not in terms of the C library's own, which sanitized builds have replaced before anything else
+// is ready.
+void *calloc(size_t count, size_t size) noexcept {
+    size_t bytes = 0;
+    if (harness::record_is_ready && harness::record().calloc_fails) {
+        errno = ENOMEM;
+        return nullptr;
+    }
+    if (__builtin_mul_overflow(count, size, &bytes)) {
+        errno = ENOMEM;
+        return nullptr;
+    }
+    void *(*volatile allocate)(size_t) = malloc; // or the compiler makes a call of calloc of it
+    void *memory = allocate(bytes);
+    if (memory != nullptr)
+        memset(memory, 0, bytes);
+    return memory;
 }
 
 void openlog(const char *ident, int options, int facility) {

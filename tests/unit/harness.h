@@ -8,6 +8,8 @@
 #include <gtest/gtest.h>
 #include <optional>
 #include <string>
+#include <sys/vfs.h>
+#include <utility>
 #include <vector>
 
 namespace harness {
@@ -27,9 +29,38 @@ LogRow row(const std::string &ident, int priority, const std::string &text);
 
 std::ostream &operator<<(std::ostream &out, const LogRow &row);
 
+// What a command that is not run does.
+struct Answer {
+    std::string output; // to a pipe
+    int status = 0;     // the exit status
+    int error = 0;      // the errno that system() leaves behind
+    bool starts = true; // or neither pipe nor shell can be had
+};
+
+Answer prints(const std::string &output);
+Answer exits(int status, int error = 0);
+Answer no_start();
+
+// Answers of commands by a part of them, the first that fits. Others succeed and print nothing.
+class ScriptedShell {
+  public:
+    using Row = std::pair<std::string, Answer>;
+    ScriptedShell(std::initializer_list<Row> rows) : rows_(rows) {}
+
+    void first(const std::string &part, const Answer &answer) {
+        rows_.insert(rows_.begin(), {part, answer});
+    }
+    Answer answer(const std::string &command) const;
+
+  private:
+    std::vector<Row> rows_;
+};
+
 // What the library did since the test began.
 struct Record {
-    std::vector<std::string> commands; // run by system or popen, in order
+    std::vector<std::string> commands;  // run by system or popen, in order
+    std::vector<std::string> steps;     // the commands and, as "sleep 2" or "usleep 200", the waits
+    std::optional<ScriptedShell> shell; // stands in for the shell
     std::vector<LogRow> log;
     bool log_is_open = false;
     std::vector<unsigned> sleeps;             // seconds
@@ -41,6 +72,11 @@ struct Record {
     int pcloses = 0; // pipes closed as pipes
     std::vector<int> semget_flags;
     bool semget_fails = false;
+    std::function<bool(short)> semop_fails; // told the operation: -1 takes, 1 releases
+    std::vector<time_t> times;              // what time() answers, the last for ever; -1 fails
+    std::optional<struct statfs> file_system;
+    std::string measured; // the path given to statfs
+    bool calloc_fails = false;
     bool fprintf_fails = false;
     bool munmap_fails = false;
 };
@@ -59,11 +95,15 @@ class Appliance : public ::testing::Test {
     static void script(const std::string &path, const std::string &body);
     static void remove(const std::string &path);
     static std::string get(const std::string &path);
+    static bool exists(const std::string &path);
 
     // BIOS product name and raidtype line, as they stand in their files.
     static void model(const std::string &product, const std::string &raidtype);
     static void four_disk_model() { model("SV-2860\n", "raidtype=5;0;4\n"); }
     static void two_disk_model() { model("SV-2740\n", "raidtype=1;0;2\n"); }
+
+    // The value of the semaphore with that key; -1 if there is none.
+    static int semaphore_value(int key);
 
     // Number of descriptors that the process has open.
     static size_t open_descriptors();

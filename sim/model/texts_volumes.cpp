@@ -1,0 +1,252 @@
+#include "model/texts_volumes.hpp"
+#include "model/arrays.hpp"
+#include "model/texts.hpp"
+#include "model/volumes.hpp"
+
+#include <algorithm>
+#include <array>
+#include <ctime>
+#include <fmt/format.h>
+
+namespace zavsim {
+
+namespace {
+
+std::uint64_t kib_of(int extents) {
+    return static_cast<std::uint64_t>(extents) * extent_kib;
+}
+
+struct Sums {
+    int pvs = 0;
+    int present = 0; // physical volumes
+    int extents = 0;
+    int used = 0;
+    int open = 0; // volumes
+};
+
+Sums sums_of(const State &state, const Group &group) {
+    Sums sums;
+    for (const PhysicalVolume *pv : pvs_of(state, group.name)) {
+        ++sums.pvs;
+        sums.present += place_of(state, *pv).size_kib > 0 ? 1 : 0;
+        sums.extents += pv->extents;
+        sums.used += used_extents(state, *pv);
+    }
+    for (const Volume &volume : group.volumes)
+        sums.open += volume.mount_point.empty() ? 0 : 1;
+    return sums;
+}
+
+// Two stripes, or what the kernel reads ahead anyway.
+int read_ahead_sectors(const State &state, const Volume &volume) {
+    const PhysicalVolume *pv =
+        volume.segments.empty() ? nullptr : pv_of_id(state, volume.segments.front().pv);
+    for (const Array &array : state.arrays)
+        if (pv != nullptr && array.uuid == pv->ground.array && array.chunk_kib > 0)
+            return static_cast<int>(array_kib(array) / array.component_kib) * array.chunk_kib * 4;
+    return 256;
+}
+
+std::string row(const char *label, const std::string &value) {
+    return fmt::format("  {:<22}{}\n", label, value);
+}
+std::string row(const char *label, std::uint64_t value) {
+    return row(label, std::to_string(value));
+}
+std::string row(const char *label, int value) {
+    return row(label, std::to_string(value));
+}
+
+std::string extents_row(const char *label, int extents) {
+    return row(label, fmt::format("{} / {}", extents, long_size(kib_of(extents))));
+}
+
+// The display tool for volumes has its labels a column wider.
+std::string wide_row(const char *label, const std::string &value) {
+    return fmt::format("  {:<22} {}\n", label, value);
+}
+
+// The word by which the metadata name a physical volume.
+std::string pv_word(const State &state, const Group &group, const std::string &id) {
+    const auto pvs = pvs_of(state, group.name);
+    for (std::size_t i = 0; i < pvs.size(); ++i)
+        if (pvs[i]->id == id)
+            return fmt::format("pv{}", i);
+    return "missing";
+}
+
+std::string sizes_comment(std::uint64_t kib) {
+    const std::uint64_t mib = kib / 1024;
+    return mib >= 1024 ? fmt::format("{:g} Gigabytes", static_cast<double>(mib) / 1024)
+                       : fmt::format("{} Megabytes", mib);
+}
+
+std::string backup_pv(const State &state, const Group &group, const PhysicalVolume &pv) {
+    const Place place = place_of(state, pv);
+    return fmt::format(
+        "\n\t\t{} {{\n\t\t\tid = \"{}\"\n\t\t\tdevice = \"{}\"\t# Hint only\n\n"
+        "\t\t\tstatus = [\"ALLOCATABLE\"]\n\t\t\tflags = [{}]\n"
+        "\t\t\tdev_size = {}\t# {}\n\t\t\tpe_start = {}\n"
+        "\t\t\tpe_count = {}\t# {}\n\t\t}}\n",
+        pv_word(state, group, pv.id), pv.id, place.size_kib == 0 ? "[unknown]" : place.node,
+        place.size_kib == 0 ? "\"MISSING\"" : "", pv.sectors, sizes_comment(pv.sectors / 2),
+        pv.first_sector, pv.extents, sizes_comment(kib_of(pv.extents)));
+}
+
+std::string backup_segments(const State &state, const Group &group, const Volume &volume) {
+    std::string text;
+    int start = 0;
+    for (std::size_t i = 0; i < volume.segments.size(); ++i) {
+        const Segment &segment = volume.segments[i];
+        text += fmt::format("{}\t\t\tsegment{} {{\n\t\t\t\tstart_extent = {}\n"
+                            "\t\t\t\textent_count = {}\t# {}\n\n\t\t\t\ttype = \"striped\"\n"
+                            "\t\t\t\tstripe_count = 1\t# linear\n\n\t\t\t\tstripes = [\n"
+                            "\t\t\t\t\t\"{}\", {}\n\t\t\t\t]\n\t\t\t}}\n",
+                            i == 0 ? "\n" : "", i + 1, start, segment.extents,
+                            sizes_comment(kib_of(segment.extents)),
+                            pv_word(state, group, segment.pv), segment.first);
+        start += segment.extents;
+    }
+    return text;
+}
+
+std::string backup_volume(const State &state, const Group &group, const Volume &volume) {
+    return fmt::format("\n\t\t{} {{\n\t\t\tid = \"{}\"\n"
+                       "\t\t\tstatus = [\"READ\", \"WRITE\", \"VISIBLE\"]\n\t\t\tflags = []\n"
+                       "\t\t\tcreation_time = {}\t# {}\n\t\t\tcreation_host = \"appliance\"\n"
+                       "\t\t\tsegment_count = {}\n{}\t\t}}\n",
+                       volume.name, volume.id, epoch_seconds(volume.created),
+                       iso_date_text(volume.created), volume.segments.size(),
+                       backup_segments(state, group, volume));
+}
+
+std::string backup_head(const State &state, const Group &group, const std::string &file) {
+    const std::string date = date_text(state.now);
+    return fmt::format("# Generated by LVM2 version 2.03.16(2) (2022-05-18): {}\n\n"
+                       "contents = \"Text Format Volume Group\"\nversion = 1\n\n"
+                       "description = \"/usr/sbin/vgcfgbackup -f {} {}\"\n\n"
+                       "creation_host = \"appliance\"\t# Linux appliance 6.1.0-56-amd64 #1 SMP "
+                       "PREEMPT_DYNAMIC Debian 6.1.192-2 (2026-11-16) x86_64\n"
+                       "creation_time = {}\t# {}\n\n",
+                       date, file, group.name, epoch_seconds(state.now), date);
+}
+
+} // namespace
+
+long long epoch_seconds(double appliance_time) {
+    return static_cast<long long>(start_of_time + appliance_time);
+}
+
+std::string iso_date_text(double appliance_time) {
+    const std::time_t seconds = epoch_seconds(appliance_time);
+    std::tm parts{};
+    gmtime_r(&seconds, &parts);
+    std::array<char, 64> text{};
+    std::strftime(text.data(), text.size(), "%Y-%m-%d %H:%M:%S +0000", &parts);
+    return text.data();
+}
+
+std::string vgdisplay_text(const State &state, const Group &group) {
+    const Sums sums = sums_of(state, group);
+    return "  --- Volume group ---\n" + row("VG Name", group.name) + row("System ID", "") +
+           row("Format", "lvm2") + row("Metadata Areas", sums.present) +
+           row("Metadata Sequence No", group.seqno) + row("VG Access", "read/write") +
+           row("VG Status", "resizable") + row("MAX LV", 0) + row("Cur LV", group.volumes.size()) +
+           row("Open LV", sums.open) + row("Max PV", 0) + row("Cur PV", sums.pvs) +
+           row("Act PV", sums.present) + row("VG Size", long_size(kib_of(sums.extents))) +
+           row("PE Size", long_size(extent_kib)) + row("Total PE", sums.extents) +
+           extents_row("Alloc PE / Size", sums.used) +
+           extents_row("Free  PE / Size", sums.extents - sums.used) + row("VG UUID", group.id) +
+           "   \n";
+}
+
+std::string vgdisplay_line(const State &state, const Group &group) {
+    const Sums sums = sums_of(state, group);
+    return fmt::format("  {}:r/w:772:-1:0:{}:{}:-1:0:{}:{}:{}:{}:{}:{}:{}:{}\n", group.name,
+                       group.volumes.size(), sums.open, sums.pvs, sums.present,
+                       kib_of(sums.extents), extent_kib, sums.extents, sums.used,
+                       sums.extents - sums.used, group.id);
+}
+
+std::string lvdisplay_text(const State &state, const Group &group, const Volume &volume) {
+    std::string text =
+        "  --- Logical volume ---\n" +
+        wide_row("LV Path", fmt::format("/dev/{}/{}", group.name, volume.name)) +
+        wide_row("LV Name", volume.name) + wide_row("VG Name", group.name) +
+        wide_row("LV UUID", volume.id) + wide_row("LV Write Access", "read/write") +
+        wide_row("LV Creation host, time", "appliance, " + iso_date_text(volume.created)) +
+        wide_row("LV Status", volume.active ? "available" : "NOT available");
+    if (volume.active)
+        text += wide_row("# open", volume.mount_point.empty() ? "0" : "1");
+    text += wide_row("LV Size", long_size(kib_of(extents_of(volume)))) +
+            wide_row("Current LE", std::to_string(extents_of(volume))) +
+            wide_row("Segments", std::to_string(volume.segments.size())) +
+            wide_row("Allocation", "inherit") + wide_row("Read ahead sectors", "auto");
+    if (volume.active)
+        text += wide_row("- currently set to", std::to_string(read_ahead_sectors(state, volume))) +
+                wide_row("Block device", fmt::format("252:{}", volume.minor));
+    return text + "   \n";
+}
+
+std::string lvdisplay_line(const Group &group, const Volume &volume) {
+    const int extents = extents_of(volume);
+    return fmt::format("  /dev/{}/{}:{}:3:{}:-1:{}:{}:{}:-1:0:-1:{}:{}\n", group.name, volume.name,
+                       group.name, volume.active ? 1 : 0, volume.mount_point.empty() ? 0 : 1,
+                       static_cast<std::uint64_t>(extents) * extent_sectors, extents,
+                       volume.active ? 252 : -1, volume.minor);
+}
+
+std::string pvdisplay_text(const State &state, const PhysicalVolume &pv) {
+    const bool in_group = !pv.group.empty();
+    const std::uint64_t kib = pv.sectors / 2;
+    const int used = used_extents(state, pv);
+    const int free = pv.extents - used;
+    const std::string size = in_group ? fmt::format("{} / not usable {}", long_size(kib),
+                                                    long_size(kib - kib_of(pv.extents)))
+                                      : long_size(kib);
+    const std::string head = in_group ? "  --- Physical volume ---\n"
+                                      : fmt::format("  \"{}\" is a new physical volume of \"{}\"\n"
+                                                    "  --- NEW Physical volume ---\n",
+                                                    place_of(state, pv).node, long_size(kib));
+    return head + row("PV Name", place_of(state, pv).node) + row("VG Name", pv.group) +
+           row("PV Size", size) +
+           row("Allocatable", !in_group   ? "NO"
+                              : free == 0 ? "yes (but full)"
+                                          : "yes ") +
+           row("PE Size", long_size(in_group ? extent_kib : 0)) +
+           row("Total PE", in_group ? pv.extents : 0) + row("Free PE", in_group ? free : 0) +
+           row("Allocated PE", used) + row("PV UUID", pv.id) + "   \n";
+}
+
+std::string pvdisplay_line(const State &state, const PhysicalVolume &pv) {
+    const std::string node = place_of(state, pv).node;
+    if (pv.group.empty())
+        return fmt::format("  \"{}\" is a new physical volume of \"{}\"\n"
+                           "  {}::{}:-1:0:0:-1:0:0:0:0:{}\n",
+                           node, long_size(pv.sectors / 2), node, pv.sectors, pv.id);
+    const int used = used_extents(state, pv);
+    return fmt::format("  {}:{}:{}:-1:8:8:-1:{}:{}:{}:{}:{}\n", node, pv.group, pv.sectors,
+                       extent_kib, pv.extents, pv.extents - used, used, pv.id);
+}
+
+std::string backup_text(const State &state, const Group &group, const std::string &file) {
+    std::string text = backup_head(state, group, file);
+    text += fmt::format("{} {{\n\tid = \"{}\"\n\tseqno = {}\n"
+                        "\tformat = \"lvm2\"\t\t\t# informational\n"
+                        "\tstatus = [\"RESIZEABLE\", \"READ\", \"WRITE\"]\n\tflags = []\n"
+                        "\textent_size = {}\t\t# 4 Megabytes\n\tmax_lv = 0\n\tmax_pv = 0\n"
+                        "\tmetadata_copies = 0\n\n\tphysical_volumes {{\n",
+                        group.name, group.id, group.seqno, extent_sectors);
+    for (const PhysicalVolume *pv : pvs_of(state, group.name))
+        text += backup_pv(state, group, *pv);
+    text += "\t}\n\n";
+    if (!group.volumes.empty()) {
+        text += "\tlogical_volumes {\n";
+        for (const Volume &volume : group.volumes)
+            text += backup_volume(state, group, volume);
+        text += "\t}\n\n";
+    }
+    return text + "}\n";
+}
+
+} // namespace zavsim
