@@ -60,6 +60,10 @@ struct Parsed {
     int rc;
     std::vector<std::string> names;
     std::vector<int> measured;
+
+    // By value: the field is aligned for 32-bit programs.
+    unsigned long long pv_size(int index) const { return group.pvdev[index].size; }
+    unsigned long long lv_size(int index) const { return group.lvdev[index].size; }
 };
 
 Parsed parse(const std::string &text, int physical, int logical,
@@ -95,9 +99,9 @@ TEST(Backup, OfARealGroupIsRead) {
     EXPECT_EQ(parsed.rc, ZAV_RC_OK);
     EXPECT_EQ(parsed.names, std::vector<std::string>{"md1"});
     EXPECT_EQ(parsed.group.pvdev[0].lvmdev.disk, 1);
-    EXPECT_EQ(parsed.group.pvdev[0].size, 1U);
+    EXPECT_EQ(parsed.pv_size(0), 1U);
     EXPECT_EQ(parsed.group.lvdev[0].lvmdev.disk, 1);
-    EXPECT_EQ(parsed.group.lvdev[0].size, 1U);
+    EXPECT_EQ(parsed.lv_size(0), 1U);
     EXPECT_EQ(parsed.group.lvdev[0].usage, 1.5F);
     EXPECT_EQ(parsed.group.lvdev[1].lvmdev.disk, 2);
     EXPECT_EQ(parsed.measured, (std::vector{1, 2}));
@@ -133,13 +137,13 @@ TEST(Backup, SizesArePhysicalSectorsInGbAndOneMore) {
                                                              {"-4194304", static_cast<zavSize>(-1)},
                                                              {"none", 1}};
     for (const auto &[sectors, gb] : sizes)
-        EXPECT_EQ(parse(kPhysical + pv("pv0", "/dev/md1", sectors), 1, 0).group.pvdev[0].size, gb)
+        EXPECT_EQ(parse(kPhysical + pv("pv0", "/dev/md1", sectors), 1, 0).pv_size(0), gb)
             << sectors;
 }
 
 TEST(Backup, SizesAreLogicalExtentsInGbAndOneMore) {
     const auto size = [](const std::vector<std::string> &extents) {
-        return parse(kExtents4M + kLogical + lv("LogVol1", extents), 0, 1).group.lvdev[0].size;
+        return parse(kExtents4M + kLogical + lv("LogVol1", extents), 0, 1).lv_size(0);
     };
     EXPECT_EQ(size({"256", "768"}), 5U);
     EXPECT_EQ(size({"256"}), 2U);
@@ -150,8 +154,7 @@ TEST(Backup, SizesAreLogicalExtentsInGbAndOneMore) {
 TEST(Backup, ExtentSizesWrapIn32Bits) {
     const auto size = [](const std::string &sectors) {
         return parse("extent_size = " + sectors + "\n" + kLogical + lv("LogVol1", {"1024"}), 0, 1)
-            .group.lvdev[0]
-            .size;
+            .lv_size(0);
     };
     EXPECT_EQ(size("4194304"), (2ULL << 30) * 1024 / (1ULL << 30) + 1); // 2 GB: the largest power
     EXPECT_EQ(size("8388608"), 1U);                                     // 4 GB: 0
@@ -160,29 +163,27 @@ TEST(Backup, ExtentSizesWrapIn32Bits) {
 }
 
 TEST(Backup, WithoutExtentSizeGivesOneGb) {
-    EXPECT_EQ(parse(kLogical + lv("LogVol1", {"1024"}), 0, 1).group.lvdev[0].size, 1U);
+    EXPECT_EQ(parse(kLogical + lv("LogVol1", {"1024"}), 0, 1).lv_size(0), 1U);
 }
 
 TEST(Backup, SegmentsEndAtClosingBraces) {
     // Two segments, the second of which the file no longer has.
     const std::string text =
         kExtents4M + kLogical + "LogVol1 {\nsegment_count = 2\nsegment1 {\nextent_count = 256\n}\n";
-    EXPECT_EQ(parse(text, 0, 1).group.lvdev[0].size, 2U);
+    EXPECT_EQ(parse(text, 0, 1).lv_size(0), 2U);
     // None: the next closing brace is the volume's.
     const Parsed none = parse(kExtents4M + kLogical + "LogVol1 {\nsegment_count = 0\n}\n" +
                                   "LogVol2 {\nsegment_count = 1\nextent_count = 512\n}\n}\n",
                               0, 2);
-    EXPECT_EQ(none.group.lvdev[0].size, 1U);
-    EXPECT_EQ(none.group.lvdev[1].size, 3U);
-    EXPECT_EQ(parse(kExtents4M + kLogical + "LogVol1 {\nsegment_count = -5\n}\n", 0, 1)
-                  .group.lvdev[0]
-                  .size,
+    EXPECT_EQ(none.lv_size(0), 1U);
+    EXPECT_EQ(none.lv_size(1), 3U);
+    EXPECT_EQ(parse(kExtents4M + kLogical + "LogVol1 {\nsegment_count = -5\n}\n", 0, 1).lv_size(0),
               1U);
 }
 
 TEST(Backup, OfManySegmentsThatAreMissingEndsAtOnce) {
     const std::string text = kLogical + "LogVol1 {\nsegment_count = 2147483647\n";
-    EXPECT_EQ(parse(text, 0, 1).group.lvdev[0].size, 1U);
+    EXPECT_EQ(parse(text, 0, 1).lv_size(0), 1U);
 }
 
 TEST(Backup, ALongerCountSwallowsWhatFollows) {
@@ -250,7 +251,7 @@ TEST(Backup, GoesOnAfterADeviceThatIsNotFound) {
               2, 1, {{"md1", BackupSource::Found::kNo}});
     EXPECT_EQ(parsed.rc, ZAV_RC_ERR);
     EXPECT_EQ(parsed.group.pvcount, 2);
-    EXPECT_EQ(parsed.group.pvdev[0].size, 3U);
+    EXPECT_EQ(parsed.pv_size(0), 3U);
     EXPECT_EQ(parsed.group.pvdev[1].lvmdev.disk, 2);
     EXPECT_EQ(parsed.group.lvdev[0].lvmdev.disk, 1);
 }
@@ -262,7 +263,7 @@ TEST(Backup, EndsThePhysicalVolumesAtADeviceWithoutAnswer) {
               2, 1, {{"md1", BackupSource::Found::kNoAnswer}});
     EXPECT_EQ(parsed.rc, ZAV_RC_ERR);
     EXPECT_EQ(parsed.group.pvcount, 0);
-    EXPECT_EQ(parsed.group.pvdev[0].size, 3U) << "the entry itself is read to its end";
+    EXPECT_EQ(parsed.pv_size(0), 3U) << "the entry itself is read to its end";
     EXPECT_EQ(parsed.names, std::vector<std::string>{"md1"});
     EXPECT_EQ(parsed.group.lvdev[0].lvmdev.disk, 1);
 }
@@ -296,7 +297,7 @@ TEST(Backup, LongLinesAreReadInPieces) {
     // The number stands in the piece that the key is not in.
     const std::string text =
         kPhysical + "pv0 {\n" + std::string(110, ' ') + "dev_size = 4194304\n}\n";
-    EXPECT_EQ(parse(text, 1, 0).group.pvdev[0].size, 1U);
+    EXPECT_EQ(parse(text, 1, 0).pv_size(0), 1U);
 }
 
 TEST(PhysicalVolumeName, KindIsToldByTheKernelName) {

@@ -67,7 +67,7 @@ class VolumeGroup : public harness::Appliance {
         EXPECT_EQ(info.type, 18010);
         EXPECT_EQ(group().lvmtype, ZAV_MINDEV_LVM_VG);
         EXPECT_EQ(group().lvmdev, (zavDevice{ZAV_DEV_LVM, ZAV_MINDEV_LVM_VG, number, 0}));
-        EXPECT_EQ(group().size, 0U);
+        EXPECT_EQ(+group().size, 0U);
         EXPECT_EQ(group().pvcount, 0);
         EXPECT_EQ(group().lvcount, 0);
         for (int i = 0; i < 9; ++i)
@@ -80,7 +80,7 @@ class VolumeGroup : public harness::Appliance {
         const lvmPV &volume = group().pvdev[index];
         EXPECT_EQ(volume.lvmtype, ZAV_MINDEV_LVM_PV);
         EXPECT_EQ(volume.lvmdev, (zavDevice{ZAV_DEV_LVM, ZAV_MINDEV_LVM_PV, 0, number}));
-        EXPECT_EQ(volume.size, 0U);
+        EXPECT_EQ(+volume.size, 0U);
         EXPECT_EQ(volume.vgdev, (zavDevice{ZAV_DEV_LVM, ZAV_MINDEV_LVM_VG, number, 0}));
         EXPECT_EQ(volume.dev, (zavDevice{ZAV_DEV_HDD, ZAV_MINDEV_HDD_SATA, 0, 0}));
     }
@@ -88,7 +88,7 @@ class VolumeGroup : public harness::Appliance {
     static void expect_preset_lv(const lvmLV &volume, int number) {
         EXPECT_EQ(volume.lvmtype, ZAV_MINDEV_LVM_LV);
         EXPECT_EQ(volume.lvmdev, (zavDevice{ZAV_DEV_LVM, ZAV_MINDEV_LVM_LV, 0, number}));
-        EXPECT_EQ(volume.size, 0U);
+        EXPECT_EQ(+volume.size, 0U);
         EXPECT_EQ(volume.usage, 0.0F);
         EXPECT_EQ(volume.vgdev, (zavDevice{ZAV_DEV_LVM, ZAV_MINDEV_LVM_VG, number, 0}));
     }
@@ -100,9 +100,9 @@ class VolumeGroup : public harness::Appliance {
         EXPECT_EQ(record().log[0], row(kIdent, 4, text));
         EXPECT_EQ(semaphore_value(kKey), 2);
         EXPECT_EQ(info.state, ZAV_LVM_NORMAL);
-        EXPECT_EQ(group().size, 2U);
+        EXPECT_EQ(+group().size, 2U);
         EXPECT_EQ(group().pvdev[0].lvmdev.disk, 1);
-        EXPECT_EQ(group().pvdev[0].size, 3U);
+        EXPECT_EQ(+group().pvdev[0].size, 3U);
         EXPECT_EQ(group().pvdev[0].dev, (zavDevice{ZAV_DEV_HDD, ZAV_MINDEV_HDD_SATA, 0, 0}));
     }
 
@@ -128,12 +128,12 @@ TEST_F(VolumeGroup, IsAskedWithTheseCommands) {
     EXPECT_TRUE(record().log.empty());
     EXPECT_EQ(semaphore_value(kKey), 1);
     EXPECT_EQ(info.state, ZAV_LVM_NORMAL);
-    EXPECT_EQ(group().size, 2U);
+    EXPECT_EQ(+group().size, 2U);
     EXPECT_EQ(group().pvcount, 1);
     EXPECT_EQ(group().lvcount, 0);
     EXPECT_EQ(group().pvdev[0].dev, (zavDevice{ZAV_DEV_RAID, ZAV_MINDEV_RAID_SW, 2, 1}));
     EXPECT_EQ(group().pvdev[0].lvmdev, (zavDevice{ZAV_DEV_LVM, ZAV_MINDEV_LVM_PV, 1, 1}));
-    EXPECT_EQ(group().pvdev[0].size, 3U);
+    EXPECT_EQ(+group().pvdev[0].size, 3U);
     for (int i = 1; i < 9; ++i)
         expect_preset_pv(i, 1);
 }
@@ -164,7 +164,7 @@ TEST_F(VolumeGroup, IsReadFromWhatTheToolsPrint) {
     EXPECT_EQ(record().log[1].ident, "semaphore_v") << "the second release";
     EXPECT_EQ(group().pvcount, 2);
     EXPECT_EQ(group().lvcount, 2);
-    EXPECT_EQ(group().size, 1U);
+    EXPECT_EQ(+group().size, 1U);
     EXPECT_EQ(group().pvdev[0].dev, (zavDevice{ZAV_DEV_RAID, ZAV_MINDEV_RAID_SW, 1, 1}));
     EXPECT_EQ(group().lvdev[1].lvmdev, (zavDevice{ZAV_DEV_LVM, ZAV_MINDEV_LVM_LV, 2, 2}));
     EXPECT_EQ(get("/etc/Kiru/zav/.vgs"), harness::data(captures + "vgs.txt"));
@@ -247,7 +247,7 @@ TEST_F(VolumeGroup, WhoseSemaphoreCannotBeTakenIsAnError) {
 TEST_F(VolumeGroup, WhoseSemaphoreCannotBeReleasedIsAnErrorWithACompleteRecord) {
     record().semop_fails = [](short operation) { return operation > 0; };
     EXPECT_EQ(ask(), ZAV_RC_ERR);
-    EXPECT_EQ(group().pvdev[0].size, 3U);
+    EXPECT_EQ(+group().pvdev[0].size, 3U);
     ASSERT_EQ(record().log.size(), 2U);
     EXPECT_NE(record().log[0].text.find("key[0x1]"), std::string::npos) << record().log[0];
     EXPECT_EQ(record().log[1], row(kIdent, 1, "[3] semaphore_v [26897] failed!!"));
@@ -269,7 +269,7 @@ TEST_F(VolumeGroup, SizePipeThatCannotBeOpenedIsTold) {
     record().shell->first("-f 12", no_start());
     expect_failure(ZAV_RC_ERR, "[5] popen failed. [" + kCommands[6] + "]", 7);
     EXPECT_EQ(group().pvcount, 1);
-    EXPECT_EQ(group().size, 0U);
+    EXPECT_EQ(+group().size, 0U);
 }
 
 TEST_F(VolumeGroup, PipesWithoutALineAreErrorsWithoutAWord) {
@@ -286,14 +286,14 @@ TEST_F(VolumeGroup, PipesWithoutALineAreErrorsWithoutAWord) {
 TEST_F(VolumeGroup, BackupThatFailsIsTold) {
     record().shell->first("vgcfgbackup", exits(5));
     expect_failure(ZAV_RC_ERR, "[11] Command failed.[" + kCommands[7] + "]", 8);
-    EXPECT_EQ(group().size, 2U);
+    EXPECT_EQ(+group().size, 2U);
     expect_preset_pv(0, 1);
 }
 
 TEST_F(VolumeGroup, BackupThatCannotBeOpenedIsTold) {
     remove("/etc/Kiru/zav/DataVG1");
     expect_failure(ZAV_RC_ERR, "[6] fopen failed. [ /etc/Kiru/zav/DataVG1 ]", 8);
-    EXPECT_EQ(group().size, 2U);
+    EXPECT_EQ(+group().size, 2U);
 }
 
 TEST_F(VolumeGroup, SizesAreKilobytesInGbAndOneMore) {
@@ -303,7 +303,7 @@ TEST_F(VolumeGroup, SizesAreKilobytesInGbAndOneMore) {
     for (const auto &[text, gb] : sizes) {
         record().shell->first("-f 12", prints(text));
         EXPECT_EQ(ask(), ZAV_RC_OK);
-        EXPECT_EQ(group().size, gb) << text;
+        EXPECT_EQ(+group().size, gb) << text;
     }
 }
 
@@ -348,7 +348,7 @@ TEST_F(VolumeGroup, LinksAreCutOutByTheRealShell) {
         put("/scratch/backup", backup(path));
         EXPECT_EQ(ask(), ZAV_RC_OK) << path;
         EXPECT_EQ(group().pvdev[0].dev, dev);
-        EXPECT_EQ(group().size, 2U);
+        EXPECT_EQ(+group().size, 2U);
         EXPECT_EQ(group().pvcount, 1);
     }
 }
@@ -431,7 +431,7 @@ TEST_F(VolumeGroup, MeasuresItsVolumesWhileItReadsThem) {
     EXPECT_EQ(group().lvcount, 1);
     EXPECT_EQ(group().lvdev[0].lvmdev, (zavDevice{ZAV_DEV_LVM, ZAV_MINDEV_LVM_LV, 2, 1}));
     EXPECT_EQ(group().lvdev[0].usage, 75.0F);
-    EXPECT_EQ(group().lvdev[0].size, 2U);
+    EXPECT_EQ(+group().lvdev[0].size, 2U);
     EXPECT_EQ(info.state, ZAV_LVM_NORMAL);
     std::vector<std::string> commands = kCommands;
     commands.push_back(kArrayLink);

@@ -124,7 +124,7 @@ class LogicalVolume : public harness::Appliance {
         EXPECT_EQ(info.type, 18010);
         EXPECT_EQ(volume().lvmtype, dev.minor_type);
         EXPECT_EQ(volume().lvmdev, dev);
-        EXPECT_EQ(volume().size, 0U);
+        EXPECT_EQ(+volume().size, 0U);
         EXPECT_EQ(volume().usage, 0.0F);
         EXPECT_EQ(volume().vgdev, (zavDevice{ZAV_DEV_LVM, ZAV_MINDEV_LVM_VG, dev.part, 0}));
         EXPECT_EQ(info.state, state);
@@ -136,7 +136,7 @@ class LogicalVolume : public harness::Appliance {
 TEST_F(LogicalVolume, ThatIsHealthyHasNoStateBit) {
     EXPECT_EQ(ask(), ZAV_RC_OK);
     EXPECT_EQ(info.state, 0);
-    EXPECT_EQ(volume().size, 3U);
+    EXPECT_EQ(+volume().size, 3U);
     EXPECT_EQ(volume().usage, 40.0F);
     EXPECT_EQ(volume().lvmdev, kVolume);
     EXPECT_EQ(volume().vgdev, (zavDevice{ZAV_DEV_LVM, ZAV_MINDEV_LVM_VG, 1, 0}));
@@ -249,11 +249,11 @@ TEST_F(LogicalVolume, WithoutSizePipeIsTold) {
 TEST_F(LogicalVolume, WithoutSizeLineHasSizeZero) {
     record().shell->first(kSize, {});
     EXPECT_EQ(ask(), ZAV_RC_OK);
-    EXPECT_EQ(volume().size, 0U);
+    EXPECT_EQ(+volume().size, 0U);
     EXPECT_EQ(volume().usage, 40.0F);
     record().shell->first(kSize, prints("a:b:c\n"));
     EXPECT_EQ(ask(), ZAV_RC_OK);
-    EXPECT_EQ(volume().size, 0U);
+    EXPECT_EQ(+volume().size, 0U);
 }
 
 TEST_F(LogicalVolume, SizeIsTheSeventhFieldInGbAndOneMore) {
@@ -271,11 +271,11 @@ TEST_F(LogicalVolume, SizeIsTheSeventhFieldInGbAndOneMore) {
     for (const auto &[sectors, gb] : sizes) {
         record().shell->first(kSize, prints(lvdisplay(sectors)));
         EXPECT_EQ(ask(), ZAV_RC_OK);
-        EXPECT_EQ(volume().size, gb) << sectors;
+        EXPECT_EQ(+volume().size, gb) << sectors;
     }
     record().shell->first(kSize, prints("::a::b:c:d:e:f:4194304"));
     EXPECT_EQ(ask(), ZAV_RC_OK);
-    EXPECT_EQ(volume().size, 3U) << "runs of colons are one";
+    EXPECT_EQ(+volume().size, 3U) << "runs of colons are one";
 }
 
 TEST_F(LogicalVolume, IsFullStrictlyAbove90Percent) {
@@ -293,7 +293,7 @@ TEST_F(LogicalVolume, ThatCannotBeMeasuredKeepsItsState) {
     record().file_system.reset();
     EXPECT_EQ(ask(), 0x2801);
     EXPECT_EQ(info.state, 0);
-    EXPECT_EQ(volume().size, 3U);
+    EXPECT_EQ(+volume().size, 3U);
     EXPECT_EQ(volume().usage, 0.0F);
     EXPECT_TRUE(record().log.empty());
 }
@@ -349,7 +349,7 @@ class PhysicalVolume : public harness::Appliance {
         EXPECT_EQ(info.type, 18010);
         EXPECT_EQ(volume().lvmtype, dev.minor_type);
         EXPECT_EQ(volume().lvmdev, dev);
-        EXPECT_EQ(volume().size, 0U);
+        EXPECT_EQ(+volume().size, 0U);
         EXPECT_EQ(volume().vgdev, (zavDevice{ZAV_DEV_LVM, ZAV_MINDEV_LVM_VG, dev.part, 0}));
         EXPECT_EQ(volume().dev, (zavDevice{ZAV_DEV_HDD, ZAV_MINDEV_HDD_SATA, 0, 0}));
         EXPECT_EQ(info.state, state);
@@ -362,7 +362,7 @@ TEST_F(PhysicalVolume, OnAnArrayIsTheGroupsEntry) {
     EXPECT_EQ(ask(), ZAV_RC_OK);
     EXPECT_EQ(info.state, ZAV_LVM_NORMAL);
     EXPECT_EQ(volume().lvmdev, kPhysical);
-    EXPECT_EQ(volume().size, 3U);
+    EXPECT_EQ(+volume().size, 3U);
     EXPECT_EQ(volume().dev, (zavDevice{ZAV_DEV_RAID, ZAV_MINDEV_RAID_SW, 2, 1}));
     EXPECT_EQ(volume().vgdev, (zavDevice{ZAV_DEV_LVM, ZAV_MINDEV_LVM_VG, 1, 0}));
     EXPECT_EQ(record().commands.back(), "/usr/sbin/pvs /dev/swraid/disk2p1 &> /dev/null");
@@ -395,7 +395,7 @@ TEST_F(PhysicalVolume, OnAnArrayThatGivesNoAnswerGetsItsCode) {
     remove("/proc/mdstat");
     EXPECT_EQ(ask(), ZAV_RC_ERR_ENOENT);
     EXPECT_EQ(info.state, ZAV_LVM_NORMAL);
-    EXPECT_EQ(volume().size, 3U);
+    EXPECT_EQ(+volume().size, 3U);
 }
 
 TEST_F(PhysicalVolume, OnADiskGoesByTheDisk) {
