@@ -13,36 +13,35 @@ namespace {
 void add_disk(std::vector<Node> &nodes, const Disk &disk, double now) {
     const std::string kernel_name = "sd" + disk.letter;
     const std::string own_name = fmt::format("/dev/sata/disk{}", disk.slot);
-    nodes.push_back({"/dev/" + kernel_name, {}, disk.kib * 1024, disk.serial, disk.label_id});
-    nodes.push_back({own_name, "../" + kernel_name, 0, 0, 0});
+    nodes.push_back({"/dev/" + kernel_name, {}, disk.kib * 1024, disk.serial});
+    nodes.push_back({own_name, "../" + kernel_name, 0, 0});
     if (disk.settles > now)
         return;
     for (const Partition &partition : disk.partitions) {
         nodes.push_back({fmt::format("/dev/{}{}", kernel_name, partition.number),
                          {},
                          partition.kib * 1024,
-                         disk.serial,
-                         0});
+                         disk.serial});
         nodes.push_back({fmt::format("{}p{}", own_name, partition.number),
-                         fmt::format("../{}{}", kernel_name, partition.number), 0, 0, 0});
+                         fmt::format("../{}{}", kernel_name, partition.number), 0, 0});
     }
 }
 
 void add_array(std::vector<Node> &nodes, const Array &array) {
     const std::string kernel_name = fmt::format("md{}", array.minor);
-    nodes.push_back({"/dev/" + kernel_name, {}, array_kib(array) * 1024, 0, 0});
+    nodes.push_back({"/dev/" + kernel_name, {}, array_kib(array) * 1024, 0});
     if (const std::string link = array_link(array.minor); !link.empty())
-        nodes.push_back({"/dev/" + link, "../" + kernel_name, 0, 0, 0});
-    nodes.push_back({"/dev/md/" + array.name, "../" + kernel_name, 0, 0, 0});
+        nodes.push_back({"/dev/" + link, "../" + kernel_name, 0, 0});
+    nodes.push_back({"/dev/md/" + array.name, "../" + kernel_name, 0, 0});
 }
 
 void add_volume(std::vector<Node> &nodes, const Group &group, const Volume &volume) {
     const std::string kernel_name = fmt::format("dm-{}", volume.minor);
     const auto extents = static_cast<std::uint64_t>(extents_of(volume));
-    nodes.push_back({"/dev/" + kernel_name, {}, extents * extent_kib * 1024, 0, 0});
+    nodes.push_back({"/dev/" + kernel_name, {}, extents * extent_kib * 1024, 0});
     nodes.push_back(
-        {fmt::format("/dev/{}/{}", group.name, volume.name), "../" + kernel_name, 0, 0, 0});
-    nodes.push_back({mapper_path(group, volume), "../" + kernel_name, 0, 0, 0});
+        {fmt::format("/dev/{}/{}", group.name, volume.name), "../" + kernel_name, 0, 0});
+    nodes.push_back({mapper_path(group, volume), "../" + kernel_name, 0, 0});
 }
 
 // Where a name of its own has a hyphen device-mapper writes two.

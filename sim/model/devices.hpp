@@ -14,7 +14,6 @@ struct Node {
     std::string target;         // of a link; empty for a node
     std::uint64_t bytes = 0;    // of a node
     int serial = 0;             // of the disk that it belongs to; 0 for an array
-    std::uint32_t label_id = 0; // of a whole disk
 };
 
 std::vector<Node> device_nodes(const State &state);

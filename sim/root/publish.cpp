@@ -82,11 +82,25 @@ void make_node(const Node &node) {
     std::error_code error;
     if (node.serial != 0 && !fs::exists(node.path))
         fs::rename(bay_of(name, node.serial), node.path, error);
-    if (fs::exists(node.path))
-        return;
-    make_sparse(node.path, node.bytes);
-    if (node.label_id != 0)
-        write_label_id(node.path, node.label_id);
+    if (!fs::exists(node.path))
+        make_sparse(node.path, node.bytes);
+}
+
+// Programs read the label from the node. Only a change of the model's is written, so that a
+// program's own bytes stay.
+void publish_labels(const State &state) {
+    using Labels = std::map<std::string, std::uint32_t>; // by serial number
+    const fs::path labels_file = place::run + "/labels";
+    const auto text = read_text(labels_file);
+    Labels labels = text ? nlohmann::json::parse(*text).get<Labels>() : Labels{};
+    for (const Disk &disk : state.disks) {
+        std::uint32_t &published = labels[std::to_string(disk.serial)];
+        if (!disk.attached || published == disk.label_id)
+            continue;
+        write_label_id("/dev/sd" + disk.letter, disk.label_id);
+        published = disk.label_id;
+    }
+    write_text(labels_file, nlohmann::json(labels).dump());
 }
 
 void publish_devices(const State &state) {
@@ -176,6 +190,7 @@ void publish(const State &state, const std::string &taken_command) {
     write_text("/proc/mdstat", mdstat_text(state));
     publish_scsi(scsi_text(state), taken_command);
     publish_devices(state);
+    publish_labels(state);
     publish_ports(state);
     publish_mounts(state);
     publish_tools(state);

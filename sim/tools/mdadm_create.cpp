@@ -7,6 +7,7 @@
 #include "root/store.hpp"
 #include "tools/command.hpp"
 #include "tools/device_argument.hpp"
+#include "tools/volume_arguments.hpp"
 
 #include <algorithm>
 #include <filesystem>
@@ -104,11 +105,6 @@ int minor_for(const State &state, const std::string &path) {
     return minor;
 }
 
-bool is_plain_name(const std::string &name) {
-    return !name.empty() && name.size() <= 32 && name != "." && name != ".." &&
-           name.find_first_of("/ \n\t") == std::string::npos;
-}
-
 NewArray new_array(const State &state, const Wanted &wanted) {
     NewArray array;
     array.minor = minor_for(state, wanted.path);
@@ -139,24 +135,26 @@ std::string take_devices(const State &state, const Wanted &wanted, NewArray &arr
     return {};
 }
 
-// What stands on the devices is told, and the user is asked once.
-bool may_write_over(const State &state, const Wanted &wanted, const NewArray &array) {
-    bool asks = false;
+// What tells of older arrays on the devices.
+std::string older_arrays(const State &state, const Wanted &wanted, const NewArray &array) {
+    std::string text;
     for (std::size_t i = 0; i < array.devices.size(); ++i) {
         const auto &[slot, number] = array.devices[i];
         const Partition &partition = *find_partition(*find_disk(state, slot), number);
         const Array *old =
             partition.superblock ? array_of_uuid(state, partition.superblock->uuid) : nullptr;
-        if (old == nullptr)
-            continue;
-        fmt::print(stderr,
-                   "mdadm: {} appears to be part of a raid array:\n"
-                   "       level={} devices={} ctime={}\n",
-                   wanted.devices[i], old->level, old->raid_devices, date_text(old->created));
-        asks = true;
+        if (old != nullptr)
+            text += fmt::format("mdadm: {} appears to be part of a raid array:\n"
+                                "       level={} devices={} ctime={}\n",
+                                wanted.devices[i], old->level, old->raid_devices,
+                                date_text(old->created));
     }
-    if (!asks || !wanted.asks)
-        return true;
+    return text;
+}
+
+// Asked once for all devices, and not at all where nothing would be lost.
+bool may_write_over(const std::string &older) {
+    fmt::print(stderr, "{}", older);
     fmt::print("Continue creating array? ");
     std::fflush(stdout);
     std::string answer;
@@ -166,7 +164,7 @@ bool may_write_over(const State &state, const Wanted &wanted, const NewArray &ar
 
 std::string check_and_prepare(const State &state, const Wanted &wanted, NewArray &array) {
     array = new_array(state, wanted);
-    if (array.minor < 0 || !is_plain_name(array.name))
+    if (array.minor < 0 || !is_valid_name(array.name))
         return fmt::format("an array called {} is not simulated", wanted.path);
     return take_devices(state, wanted, array);
 }
@@ -179,16 +177,18 @@ int run_mdadm_create(const std::vector<std::string> &words) {
     if (!problem.empty())
         return complain(problem);
     NewArray array;
+    std::string older;
     {
         Turn turn;
         const std::string wrong = check_and_prepare(turn.state(), wanted, array);
         if (!wrong.empty())
             return complain(wrong);
-        if (!may_write_over(turn.state(), wanted, array))
-            return complain("create aborted.");
+        older = older_arrays(turn.state(), wanted, array);
     }
+    // The answer may take its time, while others go on.
+    if (!older.empty() && wanted.asks && !may_write_over(older))
+        return complain("create aborted.");
     Turn turn;
-    array.devices.clear();
     const std::string wrong = check_and_prepare(turn.state(), wanted, array);
     if (!wrong.empty())
         return complain(wrong);

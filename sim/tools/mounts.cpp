@@ -21,13 +21,16 @@ int mount_problem(const std::string &tool, const std::string &text) {
     return mount_failed;
 }
 
-std::string without_last_slash(const std::string &path) {
-    return path.size() > 1 && path.back() == '/' ? path.substr(0, path.size() - 1) : path;
+// As the table of mounts has it; what does not exist stays as it was given.
+std::string whole_path(const std::string &path) {
+    std::error_code error;
+    const std::string whole = fs::canonical(path, error);
+    return error ? path : whole;
 }
 
 // By its mount point or by its device.
 VolumePlace mounted_as(State &state, const std::string &name) {
-    const VolumePlace there = volume_mounted_at(state, without_last_slash(name));
+    const VolumePlace there = volume_mounted_at(state, whole_path(name));
     return there.volume != nullptr ? there : volume_behind(state, name);
 }
 
@@ -44,6 +47,8 @@ std::string mount_volume(State &state, const std::string &device, const std::str
     if (!found.volume->mount_point.empty())
         return fmt::format("{}: {} already mounted on {}.", directory,
                            mapper_path(*found.group, *found.volume), found.volume->mount_point);
+    if (directory.find_first_of(" \t\n\\") != std::string::npos)
+        return fmt::format("{}: blanks in a mount point are not simulated", directory);
     if (volume_mounted_at(state, directory).volume != nullptr)
         return fmt::format("{}: a second file system over another is not simulated", directory);
     found.volume->mount_point = directory;
@@ -75,7 +80,7 @@ int run_mount(const std::vector<std::string> &words) {
             "mount",
             arguments.unknown.empty() ? "anything but VOLUME DIRECTORY" : arguments.unknown, 1);
     const std::string problem =
-        mount_volume(turn.state(), arguments.names[0], without_last_slash(arguments.names[1]));
+        mount_volume(turn.state(), arguments.names[0], whole_path(arguments.names[1]));
     if (!problem.empty())
         return mount_problem("mount", problem);
     turn.commit();

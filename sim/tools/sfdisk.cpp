@@ -151,9 +151,7 @@ int make_table(const std::string &path, const std::string &text) {
     fmt::print("Checking that no-one is using this disk right now ... OK\n\n");
     set_table(turn.state(), *disk, read.table);
     tell_new_table(*disk, path);
-    const std::uint32_t label_id = disk->label_id;
     turn.commit();
-    write_label_id(path, label_id);
     return 0;
 }
 

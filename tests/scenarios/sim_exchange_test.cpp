@@ -304,8 +304,10 @@ TEST(DiskTools, WriteOnADeviceWithoutCuttingItOff) {
 TEST(DiskTools, FindTheFactorysMarkOnItsDisks) {
     const Outcome run = on_appliance(
         "for d in 1 2 3 4; do od -An -tx1 -j440 -N2 /dev/sata/disk$d; done; zavsim act disk 4 "
-        "vanishes; zavsim act disk 4 appears; od -An -tx1 -j440 -N2 /dev/sata/disk4");
-    EXPECT_EQ(run.out, " 4d 10\n 4d 10\n 4d 10\n 4d 10\n 00 00\n");
+        "vanishes; zavsim act disk 4 appears; od -An -tx1 -j440 -N2 /dev/sata/disk4; zavsim act "
+        "disk 4 joins; "
+        "od -An -tx1 -j440 -N2 /dev/sata/disk4");
+    EXPECT_EQ(run.out, " 4d 10\n 4d 10\n 4d 10\n 4d 10\n 00 00\n 4d 10\n");
 }
 
 } // namespace

@@ -70,6 +70,19 @@ TEST(VolumeQueries, FailWhereTheArrayDoes) {
     EXPECT_EQ(run.out, "2\n0\n5\n5\n5\n0\n0\n");
 }
 
+// A group over an array and a disk that is taken away.
+TEST(VolumeQueries, TellAGroupThatIsNotWhole) {
+    const std::string script =
+        "zavsim act disk 4 vanishes; zavsim act disk 4 appears; vgextend DataVG1 /dev/sata/disk4 "
+        "&>/dev/null; vgs DataVG1 | tail -n 1; zavsim act disk 4 detaches; "
+        "vgs &> /tmp/list; grep -c DataVG1 /tmp/list; vgs DataVG1 &>/dev/null; echo $?; "
+        "lvremove -f DataVG1/LogVol1 &>/dev/null; echo $?; zavsim act disk 4 attaches; "
+        "vgs DataVG1 &>/dev/null; echo $?";
+    const std::string whole = "  DataVG1   2   2   0 wz--n- <1.43g <1.24g\n";
+    EXPECT_EQ(on_appliance(script).out, whole + "1\n5\n5\n0\n");
+    EXPECT_EQ(on_appliance(script, current).out, whole + "1\n0\n5\n0\n");
+}
+
 TEST(VolumeQueries, FindNoGroupOnAStoppedArray) {
     const Outcome run = on_appliance("zavsim act volume 1-1 is inactive; zavsim act volume 1-2 is "
                                      "inactive; zavsim act array 2 stops; vgs DataVG1; echo $?; "
@@ -104,6 +117,15 @@ TEST(VolumeTools, VanishAndHangAsAnyTool) {
                      "zavsim act tool lvremove exits 7; lvremove -f /dev/DataVG1/LogVol1; echo $?; "
                      "zavsim act tool pvs prints \"odd\"; pvs; lvs | wc -l");
     EXPECT_EQ(run.out, "1\n/usr/sbin/vgs\n7\nodd5\n");
+}
+
+TEST(VolumeTools, AreAllKnownToTheSentences) {
+    const Outcome run = on_appliance(
+        "for t in $(zavsim act tool none is missing 2>&1 | sed 's/.*one of: //; s/,//g'); do\n"
+        "zavsim act tool $t is missing; type -P $t; zavsim act tool $t works again\n"
+        "type -P $t >/dev/null && echo back; done | sort | uniq -c | sed 's/ *//'; "
+        "find /usr/bin /usr/sbin -lname '*/zavsim' | wc -l");
+    EXPECT_EQ(run.out, "27 back\n28\n"); // and zavsim itself
 }
 
 TEST(VolumeTools, SayWhatTheyDoNotSimulate) {
