@@ -11,9 +11,9 @@ namespace zavsim {
 
 struct Node {
     std::string path;
-    std::string target;         // of a link; empty for a node
-    std::uint64_t bytes = 0;    // of a node
-    int serial = 0;             // of the disk that it belongs to; 0 for an array
+    std::string target;      // of a link; empty for a node
+    std::uint64_t bytes = 0; // of a node
+    int serial = 0;          // of the disk that it belongs to; 0 for an array
 };
 
 std::vector<Node> device_nodes(const State &state);

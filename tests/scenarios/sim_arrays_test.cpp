@@ -185,36 +185,6 @@ TEST(SimulatedArrays, ScenarioEventsHappenAtTheirTimes) {
     EXPECT_TRUE(state.faults.front().missing);
 }
 
-TEST(SimulatedArrays, ANewRaid5BeginsWithARecoveryUnlessItIsForced) {
-    for (const bool forced : {false, true}) {
-        State state = appliance();
-        state.groups.clear();
-        ASSERT_EQ(stop_array(state, 1), Refusal::none);
-        NewArray wanted{1, "MD1", "raid5", "1.2", forced, {{1, 2}, {2, 2}, {3, 2}, {4, 2}}};
-        ASSERT_EQ(create_array(state, wanted), Refusal::none);
-        EXPECT_EQ(create_array(state, wanted), Refusal::busy);
-        const Array &made = array(state, 1);
-        EXPECT_EQ(array_kib(made), 976896U);
-        EXPECT_EQ(made.sync.kind, forced ? SyncKind::resync : SyncKind::recovery);
-        EXPECT_EQ(is_degraded(made), !forced);
-        advance(state, 241);
-        EXPECT_EQ(array(state, 1).sync.kind, SyncKind::none);
-        EXPECT_FALSE(is_degraded(array(state, 1)));
-    }
-}
-
-TEST(SimulatedArrays, ARaid10OfThreeBearsOneLoss) {
-    State state = appliance();
-    state.groups.clear();
-    ASSERT_EQ(stop_array(state, 1), Refusal::none);
-    ASSERT_EQ(create_array(state, {1, "MD1", "raid10", "1.2", true, {{1, 2}, {2, 2}, {3, 2}}}),
-              Refusal::none);
-    Array &data = array(state, 1);
-    EXPECT_EQ(array_kib(data), 488448U);
-    EXPECT_EQ(fail_member(state, data, "a", 2), Refusal::none);
-    EXPECT_EQ(fail_member(state, data, "c", 2), Refusal::busy);
-}
-
 TEST(SimulatedDisks, AVanishedDiskTakesItsNodesWithItAndAReplacementIsBlank) {
     State state = appliance();
     act(state, "disk 3 vanishes");
