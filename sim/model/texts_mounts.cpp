@@ -20,10 +20,13 @@ struct Mounted {
 // As they were mounted when the appliance started: the system's first.
 std::vector<Mounted> mounted_volumes(const State &state) {
     std::vector<Mounted> list;
-    for (auto group = state.groups.rbegin(); group != state.groups.rend(); ++group)
-        for (const Volume &volume : group->volumes)
+    for (const Group &group : state.groups) {
+        std::vector<Mounted> mounted;
+        for (const Volume &volume : group.volumes)
             if (!volume.mount_point.empty() && volume.file_system)
-                list.push_back({&*group, &volume});
+                mounted.push_back({&group, &volume});
+        list.insert(list.begin(), mounted.begin(), mounted.end());
+    }
     return list;
 }
 

@@ -158,8 +158,7 @@ std::string create_pv(State &state, const Place &place, const std::string &shown
     const PhysicalVolume *present = find_pv(state, place.ground);
     if (present != nullptr && !present->group.empty())
         return in_group_problem(*present, shown_name);
-    const std::string problem = ground_problem(state, place, shown_name);
-    if (!problem.empty())
+    if (std::string problem = ground_problem(state, place, shown_name); !problem.empty())
         return problem;
     remove_pv(state, place.ground);
     PhysicalVolume pv;
@@ -178,8 +177,7 @@ std::string create_group(State &state, const std::string &name, PhysicalVolume &
     const Group *present = find_group(state, name);
     if (present != nullptr && is_visible(state, *present))
         return fmt::format("  A volume group called {} already exists.\n", name);
-    const std::string problem = take_in(state, volume, name, shown_name);
-    if (!problem.empty())
+    if (std::string problem = take_in(state, volume, name, shown_name); !problem.empty())
         return problem;
     const Ground ground = state.physical_volumes.back().ground;
     if (present != nullptr) // what could not be seen is forgotten, but not what was just taken in
@@ -191,16 +189,14 @@ std::string create_group(State &state, const std::string &name, PhysicalVolume &
 
 std::string extend_group(State &state, Group &group, PhysicalVolume &volume,
                          const std::string &shown_name) {
-    const std::string problem = write_problem(state, group);
-    if (!problem.empty())
+    if (std::string problem = write_problem(state, group); !problem.empty())
         return problem;
     ++group.seqno;
     return take_in(state, volume, group.name, shown_name);
 }
 
 std::string create_volume(State &state, Group &group, const std::string &name, int extents) {
-    const std::string problem = write_problem(state, group);
-    if (!problem.empty())
+    if (std::string problem = write_problem(state, group); !problem.empty())
         return problem;
     if (find_volume(group, name) != nullptr)
         return fmt::format("  Logical Volume \"{}\" already exists in volume group \"{}\"\n", name,
@@ -223,9 +219,8 @@ std::string create_volume(State &state, Group &group, const std::string &name, i
 }
 
 std::string remove_volume(State &state, Group &group, const std::string &name) {
-    const std::string problem = write_problem(state, group);
     const Volume *volume = find_volume(group, name);
-    if (!problem.empty())
+    if (std::string problem = write_problem(state, group); !problem.empty())
         return problem;
     if (!volume->mount_point.empty() && !state.current_tools)
         return fmt::format("  LV {}/{} in use: device is busy\n", group.name, name);

@@ -197,6 +197,7 @@ int exec_host_dd(const std::vector<std::string> &words) {
     std::vector<std::string> copy = {"dd"};
     copy.insert(copy.end(), words.begin(), words.end());
     std::vector<char *> pointers;
+    pointers.reserve(copy.size() + 1);
     for (std::string &word : copy)
         pointers.push_back(word.data());
     pointers.push_back(nullptr);
