@@ -76,6 +76,18 @@ TEST(Doctor, AMissingToolIsCritical) {
     EXPECT_EQ(verdict(facts, "mdadm"), Severity::critical);
 }
 
+TEST(Doctor, AToolThatOnlySomeWorkNeedsIsAWarning) {
+    PlatformFacts facts = sound();
+    facts.tools.push_back({"udevinfo", "", "addresses", "no disk is added", Severity::warning});
+    EXPECT_EQ(verdict(facts, "udevinfo"), Severity::warning);
+}
+
+TEST(Doctor, GroupsNeedAPlaceForTheirFiles) {
+    PlatformFacts facts = sound();
+    facts.volume_files_error = EROFS;
+    EXPECT_EQ(verdict(facts, "volume-files"), Severity::critical);
+}
+
 TEST(Doctor, SmartctlMustTellAMissingDevice) {
     PlatformFacts facts = sound();
     facts.smartctl_no_device = exited(0);

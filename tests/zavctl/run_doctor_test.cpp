@@ -57,3 +57,16 @@ TEST(RunDoctor, SeesAnUnknownModel) {
 TEST(RunDoctor, SeesAnUnsupportedDiskCount) {
     EXPECT_EQ(checks("", {"--raidtype", "raidtype=5;0;3"})["raidtype"], "critical");
 }
+
+TEST(RunDoctor, SeesWhatVolumesNeed) {
+    for (const char *tool : {"vgs", "lvs", "pvs", "vgdisplay", "lvdisplay", "pvdisplay"})
+        EXPECT_EQ(checks("zavsim act tool " + std::string(tool) + " is missing;")[tool],
+                  "critical");
+    EXPECT_EQ(checks("rmdir /etc/Kiru/zav;")["volume-files"], "critical");
+}
+
+TEST(RunDoctor, SeesWhatTheExchangeOfADiskNeeds) {
+    for (const char *tool : {"udevinfo", "sfdisk", "dd", "hbqSetup.sh"})
+        EXPECT_EQ(checks("zavsim act tool " + std::string(tool) + " is missing;")[tool], "warning");
+    EXPECT_EQ(checks("", {"--hosts", "ata"})["sata-hosts"], "warning");
+}

@@ -20,7 +20,25 @@ TEST(RunStatus, AHealthyApplianceIsShownAndExitsWithZero) {
                        "    2 md1  RAID5  normal  disk1p2 disk2p2 disk3p2 disk4p2\n"
                        "    3 md2  RAID1  normal  disk1p3 disk2p3 disk3p3 disk4p3\n"
                        "\n"
-                       "OK: 4 disks found, 3 arrays normal\n");
+                       "Volume groups\n"
+                       "    GROUP          STATE   SIZE   VOLUMES  ON\n"
+                       "    0 PrimaryOSVG  normal  <1 GB  2        array 1\n"
+                       "    1 DataVG1      normal  <1 GB  2        array 2\n"
+                       "\n"
+                       "Physical volumes\n"
+                       "    VOLUME  STATE   SIZE   GROUP        ON\n"
+                       "    0-1     normal  <1 GB  PrimaryOSVG  array 1 (/dev/swraid/disk1p1)\n"
+                       "    1-1     normal  <1 GB  DataVG1      array 2 (/dev/swraid/disk2p1)\n"
+                       "\n"
+                       "Logical volumes\n"
+                       "    VOLUME                   STATE   SIZE   USED  MOUNTED AT\n"
+                       "    0-1 PrimaryOSVG/LogVol1  normal  <1 GB  9 %   /mnt/prios/disk1p1\n"
+                       "    0-2 PrimaryOSVG/LogVol2  normal  <1 GB  8 %   /mnt/prios/disk1p2\n"
+                       "    1-1 DataVG1/LogVol1      normal  <1 GB  8 %   /mnt/internal/data1-1\n"
+                       "    1-2 DataVG1/LogVol2      normal  <1 GB  8 %   /mnt/internal/data1-2\n"
+                       "\n"
+                       "OK: 4 disks found, 3 arrays normal, 2 volume groups normal, 2 physical "
+                       "volumes normal, 4 volumes normal\n");
 }
 
 TEST(RunStatus, AFailedDiskIsCriticalAndItsArraysDegraded) {

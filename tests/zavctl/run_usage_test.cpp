@@ -39,6 +39,12 @@ TEST(RunUsage, MissingAndExtraArgumentsAreRefused) {
     expect_usage({"disk", "list", "more"}, "'more' is one word too many");
     expect_usage({"disk", "list", "--json", "--jsonl"}, "exclude each other");
     expect_usage({"disk", "list", "--timeout", "0"}, "--timeout");
+    expect_usage({"lv", "show", "1"}, "'1' is no logical volume");
+    expect_usage({"pv", "show", "/dev/DataVG1/LogVol1"}, "is no physical volume");
+    expect_usage({"vg", "show", "-1"}, "-1");
+    expect_usage({"disk", "remove"}, "N is required");
+    expect_usage({"disk", "add", "three"}, "three");
+    expect_usage({"disk", "remove", "3", "--force"}, "unknown option '--force'");
     expect_usage({"name", "hdd", "saat", "1"}, "Did you mean 'sata'?");
 }
 
@@ -61,7 +67,18 @@ TEST(RunUsage, EveryLevelHasItsHelp) {
                                                           {"disk", "show"},
                                                           {"array"},
                                                           {"array", "list"},
+                                                          {"disk", "remove"},
+                                                          {"disk", "add"},
                                                           {"array", "show"},
+                                                          {"vg"},
+                                                          {"vg", "list"},
+                                                          {"vg", "show"},
+                                                          {"lv"},
+                                                          {"lv", "list"},
+                                                          {"lv", "show"},
+                                                          {"pv"},
+                                                          {"pv", "list"},
+                                                          {"pv", "show"},
                                                           {"bios"},
                                                           {"bios", "show"},
                                                           {"bios", "save"},

@@ -54,16 +54,14 @@ std::string what_is_wrong(const Answer &answer) {
     return joined(told_together(findings(answer)), "; ");
 }
 
-std::string section_text(const Section &section, const Style &style) {
+// A line keeps its mark and indentation when it is wrapped.
+std::string line_text(const std::string &line, const Style &style) {
+    constexpr std::size_t indent = 4;
+    if (style.width <= indent || line.size() <= indent)
+        return line + "\n";
     std::string out;
-    if (!section.title.empty())
-        out += bold(section.title, style) + "\n";
-    if (!section.table.empty())
-        out += section.table.text(style);
-    for (std::size_t i = 0; i < section.details.size(); ++i)
-        out += (i > 0 ? "\n" : "") + section.details[i].text(style);
-    for (const std::string &line : section.lines)
-        out += line + "\n";
+    for (const std::string &part : wrapped(line.substr(indent), style.width - indent))
+        out += (out.empty() ? line.substr(0, indent) : std::string(indent, ' ')) + part + "\n";
     return out;
 }
 
@@ -104,6 +102,19 @@ std::string in_words(const Failure &failure) {
     if (failure.name.empty())
         return fmt::format("{} (code {})", failure.meaning, number);
     return fmt::format("{} ({}, code {})", failure.meaning, failure.name, number);
+}
+
+std::string section_text(const Section &section, const Style &style) {
+    std::string out;
+    if (!section.title.empty())
+        out += bold(section.title, style) + "\n";
+    if (!section.table.empty())
+        out += section.table.text(style);
+    for (std::size_t i = 0; i < section.details.size(); ++i)
+        out += (i > 0 ? "\n" : "") + section.details[i].text(style);
+    for (const std::string &line : section.lines)
+        out += line_text(line, style);
+    return out;
 }
 
 Severity severity(const Answer &answer) {

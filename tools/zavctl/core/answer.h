@@ -48,6 +48,7 @@ Severity severity(const Answer &answer);
 // worst come first.
 std::string summary(const Answer &answer);
 
+std::string section_text(const Section &section, const Style &style);
 std::string to_text(const Answer &answer, const Style &style);
 std::string to_json(const Answer &answer);  // one object, indented
 std::string to_jsonl(const Answer &answer); // one record per line

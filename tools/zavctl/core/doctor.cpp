@@ -58,7 +58,7 @@ void check_tools(const PlatformFacts &facts, Checks &checks) {
         if (!tool.found.empty())
             checks.push_back(well(name, printable(tool.found) + ", for " + tool.purpose));
         else
-            checks.push_back({Severity::critical, name,
+            checks.push_back({tool.missing, name,
                               tool.name.starts_with("/")
                                   ? tool.name + " is missing or not executable"
                                   : "not on the PATH",
@@ -237,6 +237,16 @@ void check_semaphores(const PlatformFacts &facts, Checks &checks) {
                           "controller's report cannot be read"});
 }
 
+void check_volume_files(const PlatformFacts &facts, Checks &checks) {
+    if (facts.volume_files_error == 0)
+        checks.push_back(well("volume-files", "/etc/Kiru/zav takes files"));
+    else
+        checks.push_back({Severity::critical, "volume-files",
+                          "/etc/Kiru/zav: " + why(facts.volume_files_error),
+                          "the queries of volume groups keep the tools' words there: every group "
+                          "reads as not existing"});
+}
+
 void check_log(const PlatformFacts &facts, Checks &checks) {
     if (facts.log_socket)
         checks.push_back(well("syslog", "/dev/log is there"));
@@ -288,6 +298,7 @@ Checks platform_checks(const PlatformFacts &facts) {
     check_software_raid(facts, checks);
     check_nvram(facts, checks);
     check_semaphores(facts, checks);
+    check_volume_files(facts, checks);
     check_log(facts, checks);
     check_locale(facts, checks);
     return checks;

@@ -29,6 +29,7 @@ struct ToolFact {
     std::string found;   // where it is, "" if nowhere
     std::string purpose; // "health of disks"
     std::string without; // what its absence does to the answers
+    Severity missing = Severity::critical;
 };
 
 // What doctor found out about the machine; gathered in one go, judged afterwards.
@@ -55,6 +56,7 @@ struct PlatformFacts {
     std::string decimal_point;
     int semaphore_error = 0; // errno of creating, using and removing one
     bool log_socket = false;
+    int volume_files_error = 0; // errno of making a file where the queries of groups keep theirs
 };
 
 struct Check {

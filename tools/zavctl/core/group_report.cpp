@@ -53,11 +53,9 @@ std::string volumes_text(const GroupReport &group) {
 Section common_section(const std::vector<GroupReport> &groups) {
     Section section;
     section.key = "volume_groups";
-    for (const GroupReport &group : groups) {
+    for (const GroupReport &group : groups)
         section.records.push_back(group_json(group));
-        if (severity(group) != Severity::ok)
-            section.findings.push_back(finding(group));
-    }
+    section.findings = group_findings(groups);
     const auto normal = std::count_if(groups.begin(), groups.end(), [](const GroupReport &group) {
         return group.state == ZAV_LVM_NORMAL && severity(group) == Severity::ok;
     });
@@ -160,6 +158,14 @@ std::string group_note(const GroupReport &group) {
     if ((group.state & ZAV_LVM_INACTIVE) != 0)
         return "a logical volume is not active";
     return "";
+}
+
+std::vector<Finding> group_findings(const std::vector<GroupReport> &groups) {
+    std::vector<Finding> findings;
+    for (const GroupReport &group : groups)
+        if (severity(group) != Severity::ok)
+            findings.push_back(finding(group));
+    return findings;
 }
 
 Json group_json(const GroupReport &group) {

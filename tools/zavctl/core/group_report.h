@@ -46,6 +46,9 @@ Severity severity(const GroupReport &group);
 std::string shown_state(const GroupReport &group);
 std::string group_note(const GroupReport &group);
 
+// What is not well with the groups; an empty list of volumes alone would look well.
+std::vector<Finding> group_findings(const std::vector<GroupReport> &groups);
+
 Json group_json(const GroupReport &group);
 Section group_list_section(const std::vector<GroupReport> &groups);
 Section group_show_section(const std::vector<GroupReport> &groups);

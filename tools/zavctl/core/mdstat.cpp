@@ -122,6 +122,16 @@ std::string member_state(std::string_view block, std::string_view node) {
     return holds(entry, "(S)") ? "spare" : "active";
 }
 
+std::string array_of_member(std::string_view mdstat, std::string_view node) {
+    const std::string entry = fmt::format(" {}[", node);
+    while (!node.empty() && !mdstat.empty()) {
+        const std::string_view line = take_line(mdstat);
+        if (!line.starts_with(" ") && holds(line, entry))
+            return std::string(line.substr(0, line.find(' ')));
+    }
+    return "";
+}
+
 std::vector<MdstatProblem> mdstat_problems(std::string_view mdstat) {
     std::vector<MdstatProblem> problems;
     for (const char *name : {"md0", "md1", "md2", "md3"}) {

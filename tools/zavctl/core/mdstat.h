@@ -22,6 +22,9 @@ std::string mdstat_mixup(std::string_view mdstat, std::string_view kernel_name);
 // (not listed), or "unknown" if there are no lines. `node` is the kernel's name of it: "sdc2".
 std::string member_state(std::string_view block, std::string_view node);
 
+// The kernel's name of the array whose line lists the partition; "" if none does.
+std::string array_of_member(std::string_view mdstat, std::string_view node);
+
 struct MdstatProblem {
     std::string kernel_name;
     std::string reason;

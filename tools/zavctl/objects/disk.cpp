@@ -1,3 +1,4 @@
+#include "disk_verbs.h"
 #include "surveys.h"
 
 #include "../system/library.h"
@@ -101,7 +102,7 @@ std::vector<Question> ask_disks(const Machine &machine, const std::vector<int> &
 }
 
 void add_disk(CLI::App &root, Session &session) {
-    CLI::App *disk = add_object(root, "disk", "The disks: list, show");
+    CLI::App *disk = add_object(root, "disk", "The disks: list, show, remove, add");
     const auto all = std::make_shared<bool>(false);
     CLI::App *list = add_verb(*disk, session, "list", list_help);
     list->add_flag("--all", *all, "Ask every slot of the model, also those that no array uses");
@@ -119,6 +120,8 @@ void add_disk(CLI::App &root, Session &session) {
             return disk_answer(session, read_machine(), *slots, "disk show");
         };
     });
+    add_disk_remove(*disk, session);
+    add_disk_add(*disk, session);
 }
 
 } // namespace zavctl

@@ -10,10 +10,12 @@ constexpr VerbHelp help = {
     "Checks everything that the library needs of this system",
     "Shown: one line per precondition with what was found and, where something is missing, what\n"
     "that means for the answers: the shell, the model and its configuration, the tools and what\n"
-    "they answer, /proc/mdstat, device names, hot plug, the BIOS device, locks, the log, locale.\n"
+    "they answer, /proc/mdstat, device names, hot plug, the BIOS device, locks, the log, locale,\n"
+    "and what volumes and the exchange of a disk need besides.\n"
     "Warning: some functions or some arrays are affected.\n"
     "Critical: states of disks and arrays cannot be trusted or told.\n"
-    "Nothing is changed; a tool that does not answer is given 10 seconds.",
+    "Nothing is changed (a file is made in /etc/Kiru/zav and removed); a tool that does not answer "
+    "is given 10 seconds.",
     "  zavctl doctor\n"
     "  zavctl doctor --jsonl | jq -r 'select(.severity != \"ok\") | .check'",
 };

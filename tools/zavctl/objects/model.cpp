@@ -20,6 +20,15 @@ constexpr VerbHelp help = {
     "  zavctl model --json | jq -r .model.serial",
 };
 
+std::string missing_volume_tool() {
+    for (const char *name : {"vgs", "lvs", "pvs", "vgdisplay", "lvdisplay", "pvdisplay"}) {
+        const std::string path = std::string("/usr/sbin/") + name;
+        if (find_tool(path).empty())
+            return path;
+    }
+    return "";
+}
+
 } // namespace
 
 ModelReport read_model() {
@@ -40,10 +49,14 @@ ModelReport read_model() {
 Machine read_machine() {
     Machine machine;
     machine.model = read_model();
+    const RunResult shell = run({"/bin/sh", "-c", "false &>/dev/null"}, shell_limit);
+    const std::string doubt = shell_doubt(shell);
+    machine.volume_doubt =
+        doubt.empty() ? "" : "a shell that is not bash: every group reads as there";
+    machine.volume_tool_missing = missing_volume_tool();
     if (machine.model.hardware_raid())
         return machine;
-    const RunResult shell = run({"/bin/sh", "-c", "false &>/dev/null"}, shell_limit);
-    machine.disk_doubt = shell_doubt(shell);
+    machine.disk_doubt = doubt;
     if (machine.disk_doubt.empty())
         machine.disk_doubt = smartctl_doubt(find_tool("smartctl"));
     if (find_tool("/sbin/mdadm").empty())

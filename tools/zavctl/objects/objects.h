@@ -14,8 +14,10 @@ namespace zavctl {
 // What is known of the machine before anything is asked about its devices.
 struct Machine {
     ModelReport model;
-    std::string disk_doubt;  // why answers about disks cannot be trusted, "" if they can
-    std::string array_doubt; // why arrays give no answer, "" if nothing is known of it
+    std::string disk_doubt;          // why answers about disks cannot be trusted, "" if they can
+    std::string array_doubt;         // why arrays give no answer, "" if nothing is known of it
+    std::string volume_doubt;        // why answers about volumes cannot be trusted, "" if they can
+    std::string volume_tool_missing; // the first LVM tool that is not there, "" if all are
 };
 
 ModelReport read_model();
@@ -25,6 +27,7 @@ Machine read_machine();
 struct Survey {
     std::vector<Question> questions;
     std::function<Section()> report;
+    std::function<std::vector<Question>()> further = nullptr; // asked once those are answered
 };
 
 // Reports that a survey fills and others may look at.
@@ -38,6 +41,9 @@ void add_status(CLI::App &root, Session &session);
 void add_model(CLI::App &root, Session &session);
 void add_disk(CLI::App &root, Session &session);
 void add_array(CLI::App &root, Session &session);
+void add_vg(CLI::App &root, Session &session);
+void add_pv(CLI::App &root, Session &session);
+void add_lv(CLI::App &root, Session &session);
 void add_bios(CLI::App &root, Session &session);
 void add_name(CLI::App &root, Session &session);
 void add_doctor(CLI::App &root, Session &session);

@@ -1,4 +1,5 @@
 #include "surveys.h"
+#include "volume_surveys.h"
 
 #include <iterator>
 
@@ -8,11 +9,13 @@ namespace {
 
 constexpr VerbHelp help = {
     "The whole appliance on one screen",
-    "Shown: the model, the disks and the arrays with level, members and state, a progress bar\n"
-    "while one rebuilds, and one line that sums it up. The words for the states are explained\n"
-    "by 'zavctl disk list --help' and 'zavctl array list --help'. Rows begin with a mark:\n"
-    "! warning, ? could not tell, X critical.\n"
-    "Everything is asked at the same time; an empty slot takes about 20 seconds.",
+    "Shown: the model; the disks; the arrays with level, members and state, a progress bar\n"
+    "while one rebuilds; the volume groups with what they lie on; the logical volumes with usage\n"
+    "and mount point; and one line that sums it up. The words for the states are explained by\n"
+    "'zavctl disk list --help' and so on. Rows begin with a mark: ! warning, ? could not tell,\n"
+    "X critical.\n"
+    "Disks, arrays and groups are asked at the same time, then the volumes; an empty slot takes\n"
+    "about 20 seconds, an inactive volume about 40.",
     "  zavctl status\n"
     "  zavctl status --json | jq -r .summary\n"
     "  zavctl status >/dev/null || echo 'look at this appliance'",
@@ -21,6 +24,9 @@ constexpr VerbHelp help = {
 struct Asked {
     Shared<DiskReport> disks = std::make_shared<std::vector<DiskReport>>();
     Shared<ArrayReport> arrays = std::make_shared<std::vector<ArrayReport>>();
+    Shared<GroupReport> groups = std::make_shared<std::vector<GroupReport>>();
+    Shared<VolumeReport> volumes = std::make_shared<std::vector<VolumeReport>>();
+    Shared<PvReport> pvs = std::make_shared<std::vector<PvReport>>();
 };
 
 Survey disks_survey(const Machine &machine, const Session &session, const Asked &asked) {
@@ -39,9 +45,48 @@ Survey arrays_survey(const Machine &machine, const Session &session, const Asked
             }};
 }
 
+// A table without rows is no section of the screen; its records are.
+Section titled(Section section, const char *title) {
+    if (section.records.empty()) {
+        section.table = Table();
+        section.well.clear();
+    } else {
+        section.title = title;
+    }
+    return section;
+}
+
+Survey groups_survey(const Machine &machine, const Session &session, const Asked &asked) {
+    return {ask_groups(machine, listed_groups(machine), session, asked.groups),
+            [asked] { return titled(group_list_section(*asked.groups), "Volume groups"); }};
+}
+
+Survey volumes_survey(const Machine &machine, const Session &session, const Asked &asked) {
+    return {{},
+            [asked] {
+                return titled(volume_list_section(*asked.volumes, volumes_of(*asked.groups).more),
+                              "Logical volumes");
+            },
+            [&machine, &session, asked] {
+                return ask_volumes(machine, volumes_of(*asked.groups).ids, session, asked.volumes);
+            }};
+}
+
+Survey pvs_survey(const Machine &machine, const Session &session, const Asked &asked) {
+    return {{},
+            [asked] {
+                return titled(pv_list_section(*asked.pvs, pvs_of(*asked.groups).more),
+                              "Physical volumes");
+            },
+            [&machine, &session, asked] {
+                return ask_pvs(machine, pvs_of(*asked.groups).ids, session, asked.pvs);
+            }};
+}
+
 // The sections below the heading, from top to bottom.
 using MakeSurvey = Survey (*)(const Machine &, const Session &, const Asked &);
-constexpr MakeSurvey parts[] = {disks_survey, arrays_survey};
+constexpr MakeSurvey parts[] = {disks_survey, arrays_survey, groups_survey, pvs_survey,
+                                volumes_survey};
 
 // The model stands in the heading; its section adds its record and its findings.
 Section model_part(const Machine &machine) {
@@ -51,19 +96,36 @@ Section model_part(const Machine &machine) {
     return section;
 }
 
-Answer status(Session &session) {
-    const Machine machine = read_machine();
+std::vector<Survey> surveys_of(const Machine &machine, const Session &session) {
     const Asked asked;
     std::vector<Survey> surveys;
-    std::vector<Question> questions;
-    if (machine.model.known()) {
-        for (const MakeSurvey part : parts) {
+    if (machine.model.known())
+        for (const MakeSurvey part : parts)
             surveys.push_back(part(machine, session, asked));
-            questions.insert(questions.end(), surveys.back().questions.begin(),
-                             surveys.back().questions.end());
-        }
-    }
+    return surveys;
+}
+
+void append(std::vector<Question> &all, const std::vector<Question> &more) {
+    all.insert(all.end(), more.begin(), more.end());
+}
+
+// Everything that can be asked at once, then what only the answers made known.
+void ask(Session &session, const std::vector<Survey> &surveys) {
+    std::vector<Question> questions;
+    for (const Survey &survey : surveys)
+        append(questions, survey.questions);
     session.ask(questions);
+    questions.clear();
+    for (const Survey &survey : surveys)
+        if (survey.further)
+            append(questions, survey.further());
+    session.ask(questions);
+}
+
+Answer status(Session &session) {
+    const Machine machine = read_machine();
+    const std::vector<Survey> surveys = surveys_of(machine, session);
+    ask(session, surveys);
     Answer answer{"status", model_heading(machine.model), {model_part(machine)}};
     for (const Survey &survey : surveys)
         answer.sections.push_back(survey.report());

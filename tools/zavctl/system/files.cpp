@@ -44,4 +44,9 @@ std::vector<std::string> names_in(const std::string &directory, int &error) {
     return names;
 }
 
+bool is_mounted(const std::string &directory) {
+    const std::string mounts = read_file("/etc/mtab").text;
+    return mounts.find(" " + directory + " ") != std::string::npos;
+}
+
 } // namespace zavctl

@@ -14,4 +14,7 @@ FileFact read_file(const std::string &path);
 // The names in a directory, sorted; empty if it cannot be read (then `error` says why).
 std::vector<std::string> names_in(const std::string &directory, int &error);
 
+// Whether something is mounted at exactly this directory.
+bool is_mounted(const std::string &directory);
+
 } // namespace zavctl

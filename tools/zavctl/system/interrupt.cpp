@@ -13,6 +13,8 @@ namespace zavctl {
 namespace {
 
 std::atomic<bool> ending = false;
+std::atomic<bool> changing = false;
+std::atomic<int> told = -1; // where to tell that a change is finished first
 
 bool is_ignored(int number) {
     struct sigaction action {};
@@ -36,6 +38,16 @@ bool is_ignored(int number) {
     _exit(128 + number); // another thread's system() has just had the signal ignored again
 }
 
+// True if a change is under way: the signal is told of and has no other effect.
+bool change_goes_on() {
+    constexpr char message[] = "\nzavctl: the change is finished first; stopped halfway it would "
+                               "leave the disks in between\n";
+    if (!changing)
+        return false;
+    [[maybe_unused]] const auto done = write(told, message, sizeof message - 1);
+    return true;
+}
+
 } // namespace
 
 void end_on_interrupt() {
@@ -47,14 +59,24 @@ void end_on_interrupt() {
     pthread_sigmask(SIG_BLOCK, &set, nullptr);
     std::thread([set] {
         int number = 0;
-        if (sigwait(&set, &number) == 0)
-            end_by(number);
+        while (sigwait(&set, &number) == 0)
+            if (!change_goes_on())
+                end_by(number);
     }).detach();
 }
 
 void stay_if_ending() {
     while (ending)
         pause();
+}
+
+ChangeGuard::ChangeGuard(int tell) {
+    told = tell;
+    changing = true;
+}
+
+ChangeGuard::~ChangeGuard() {
+    changing = false;
 }
 
 } // namespace zavctl

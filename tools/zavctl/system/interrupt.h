@@ -12,4 +12,15 @@ void end_on_interrupt();
 // Call before telling anything.
 void stay_if_ending();
 
+// While one of these lives, the machine is being changed: an interrupt is told of on the
+// descriptor and does no more, since tools that are ended halfway would leave things behind that
+// nobody knows.
+class ChangeGuard {
+  public:
+    explicit ChangeGuard(int tell);
+    ~ChangeGuard();
+    ChangeGuard(const ChangeGuard &) = delete;
+    ChangeGuard &operator=(const ChangeGuard &) = delete;
+};
+
 } // namespace zavctl

@@ -1,12 +1,14 @@
 #include "library.h"
 
 #include <array>
+#include <mutex>
 
 namespace zavctl::library {
 
 namespace {
 
 constexpr std::size_t name_size = 128;
+constexpr int attach_command = 1;
 
 struct CodeMeaning {
     int code;
@@ -20,9 +22,12 @@ constexpr CodeMeaning meanings[] = {
     {ZAV_RC_ERR_EBUSY, "the device is busy"},
     {ZAV_RC_ERR_ENODEV, "no such device"},
     {ZAV_RC_ERR_EINVAL, "the library refuses this address"},
+    {ZAV_RC_ERR_ESTRPIPE, "a tool cannot be started"},
+    {32, "a tool cannot be started"},
     {ZAV_RC_ERR, "a step failed"},
     {0x1001, "the saved file came out too short"},
     {0x1301, "no known model"},
+    {0x2801, "the mount point cannot be measured"},
 };
 
 std::string meaning(int code) {
@@ -99,6 +104,57 @@ RaidAnswer raid_state(const zavDevice &device) {
     zavDevice copy = device;
     answer.result = zavGetStateRaid(&copy, &answer.state);
     return answer;
+}
+
+VolumeAnswer volume_state(const zavDevice &device) {
+    // These hold a lock between processes. A thread that waits for it is woken up by the end of
+    // another's tool, and the wait counts as failed: wait here instead.
+    static std::mutex one_at_a_time;
+    std::unique_lock lock(one_at_a_time, std::defer_lock);
+    if (device.minor_type != ZAV_MINDEV_LVM_LV)
+        lock.lock();
+    VolumeAnswer answer;
+    zavDevice copy = device;
+    answer.result = zavGetStateLVM(&copy, &answer.state);
+    return answer;
+}
+
+std::string mount_point(const zavDevice &volume) {
+    std::array<char, name_size> buffer{};
+    zavDevice copy = volume;
+    zavDevToMnt(&copy, buffer.data());
+    return buffer.data();
+}
+
+int ata_disk_count() {
+    int count = 0;
+    return get_diskcount(&count) == ZAV_RC_OK ? count : 0;
+}
+
+int attach_disk(const zavDevice &disk) {
+    zavDevice copy = disk;
+    return zavHotCmd(attach_command, &copy);
+}
+
+int add_disk(const zavDevice &disk) {
+    zavDevice copy = disk;
+    return zavDiskHotAdd(&copy);
+}
+
+int remove_disk(const zavDevice &disk) {
+    zavDevice copy = disk;
+    return zavDiskHotRemove(&copy);
+}
+
+int add_to_group(const zavDevice &device, const zavDevice &group) {
+    zavDevice device_copy = device;
+    zavDevice group_copy = group;
+    return zavLVMHotAdd(&device_copy, &group_copy);
+}
+
+int remove_group(const zavDevice &group) {
+    zavDevice copy = group;
+    return zavLVMHotRemove(&copy);
 }
 
 int save_bios(const std::string &file) {

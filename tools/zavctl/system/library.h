@@ -33,6 +33,11 @@ struct RaidAnswer {
     zavRaidState state{};
 };
 
+struct VolumeAnswer {
+    int result = 0;
+    zavLVMState state{};
+};
+
 ModelConfig model_config();
 int data_raid_type();
 std::optional<std::string> product_name();
@@ -44,6 +49,19 @@ int name_result(const zavDevice &device);    // what the library says to the con
 
 DiskAnswer disk_state(const zavDevice &device);
 RaidAnswer raid_state(const zavDevice &device);
+
+// Of a group, a logical or a physical volume: see the record's `dev`.
+VolumeAnswer volume_state(const zavDevice &device);
+std::string mount_point(const zavDevice &volume);
+
+int ata_disk_count(); // 0 if it cannot be told
+
+// What changes the machine: the library's codes.
+int attach_disk(const zavDevice &disk);
+int add_disk(const zavDevice &disk);
+int remove_disk(const zavDevice &disk);
+int add_to_group(const zavDevice &device, const zavDevice &group);
+int remove_group(const zavDevice &group);
 
 int save_bios(const std::string &file);
 int load_bios(const std::string &file);

@@ -35,23 +35,54 @@ struct Tool {
     const char *purpose;
     const char *without;
     bool software_raid; // not needed on the hardware-RAID model
+    Severity missing;
 };
+
+constexpr const char *no_volumes = "no volume group and no volume can be told";
+constexpr const char *no_devices = "what groups lie on cannot be told, and no disk is added";
+constexpr const char *no_addition = "a disk that is added is wiped and joins nothing";
+constexpr const char *no_setup = "the volumes of a data array that is created anew are not made";
 
 // A function that needs another tool adds it here.
 constexpr Tool tools[] = {
-    {"smartctl", "the health of disks", "every disk that is there reads as failed", true},
-    {"/sbin/mdadm", "the state of arrays", "the state of no array can be told", true},
-    {"cat", "counting disks", "no disk is counted", false},
-    {"grep", "counting disks", "no disk is counted", false},
-    {"wc", "counting disks", "no disk is counted", false},
+    {"smartctl", "the health of disks", "every disk that is there reads as failed", true,
+     Severity::critical},
+    {"/sbin/mdadm", "the state of arrays", "the state of no array can be told", true,
+     Severity::critical},
+    {"cat", "counting disks", "no disk is counted", false, Severity::critical},
+    {"grep", "counting disks", "no disk is counted", false, Severity::critical},
+    {"wc", "counting disks", "no disk is counted", false, Severity::critical},
+    {"/usr/sbin/vgs", "volume groups", no_volumes, false, Severity::critical},
+    {"/usr/sbin/lvs", "logical volumes", no_volumes, false, Severity::critical},
+    {"/usr/sbin/pvs", "physical volumes", no_volumes, false, Severity::critical},
+    {"/usr/sbin/vgdisplay", "volume groups", no_volumes, false, Severity::critical},
+    {"/usr/sbin/lvdisplay", "logical volumes", no_volumes, false, Severity::critical},
+    {"/usr/sbin/pvdisplay", "physical volumes", no_volumes, false, Severity::critical},
+    {"/usr/sbin/vgcfgbackup", "what groups consist of", "no volume group can be told", false,
+     Severity::critical},
+    {"udevinfo", "the addresses of devices", no_devices, false, Severity::warning},
+    {"/sbin/sfdisk", "adding a disk", no_addition, true, Severity::warning},
+    {"/bin/dd", "adding a disk", no_addition, true, Severity::warning},
+    {"/usr/bin/hbqSetup.sh", "setting up volumes", no_setup, true, Severity::warning},
 };
 
 std::vector<ToolFact> read_tools(bool hardware_raid) {
     std::vector<ToolFact> facts;
     for (const Tool &tool : tools)
         if (!tool.software_raid || !hardware_raid)
-            facts.push_back({tool.name, find_tool(tool.name), tool.purpose, tool.without});
+            facts.push_back(
+                {tool.name, find_tool(tool.name), tool.purpose, tool.without, tool.missing});
     return facts;
+}
+
+// Makes a file where the library makes some, and takes it away again.
+int try_volume_files() {
+    std::string name = "/etc/Kiru/zav/.zavctl-XXXXXX";
+    const int descriptor = mkostemp(name.data(), O_CLOEXEC);
+    if (descriptor < 0)
+        return errno;
+    close(descriptor);
+    return unlink(name.c_str()) == 0 ? 0 : errno;
 }
 
 std::string resolved(const char *path) {
@@ -173,6 +204,7 @@ PlatformFacts read_platform(const ModelReport &model) {
     facts.examined = first_partition(facts.sata_nodes);
     facts.semaphore_error = try_semaphore();
     facts.log_socket = is_socket("/dev/log");
+    facts.volume_files_error = try_volume_files();
     read_hosts(facts);
     read_nvram(facts);
     read_locale(facts);

@@ -4,7 +4,6 @@
 
 #include <cerrno>
 #include <csignal>
-#include <cstdio>
 #include <cstdlib>
 #include <fcntl.h>
 #include <string_view>
@@ -54,6 +53,17 @@ std::size_t terminal_width(int descriptor) {
     return size.ws_col;
 }
 
+// 0, or errno of the failure.
+int write_all(int descriptor, std::string_view rest) {
+    while (!rest.empty()) {
+        const ssize_t done = ::write(descriptor, rest.data(), rest.size());
+        if (done < 0 && errno != EINTR)
+            return errno;
+        rest.remove_prefix(done < 0 ? 0 : static_cast<std::size_t>(done));
+    }
+    return 0;
+}
+
 } // namespace
 
 Streams::Streams() {
@@ -61,6 +71,7 @@ Streams::Streams() {
     in_ = private_copy(STDIN_FILENO);
     for (const int descriptor : {STDIN_FILENO, STDOUT_FILENO, STDERR_FILENO})
         occupy(descriptor);
+    err_ = private_copy(STDERR_FILENO);
     dup2(STDERR_FILENO, STDOUT_FILENO);
     const int null = open("/dev/null", O_RDONLY | O_CLOEXEC);
     if (null >= 0) {
@@ -71,19 +82,11 @@ Streams::Streams() {
 }
 
 int Streams::write(const std::string &text) const {
-    std::string_view rest = text;
-    while (!rest.empty()) {
-        const ssize_t done = ::write(out_, rest.data(), rest.size());
-        if (done < 0 && errno != EINTR)
-            return errno;
-        rest.remove_prefix(done < 0 ? 0 : static_cast<std::size_t>(done));
-    }
-    return 0;
+    return write_all(out_, text);
 }
 
 void Streams::say(const std::string &text) const {
-    std::fputs(text.c_str(), stderr);
-    std::fflush(stderr);
+    write_all(err_, text); // nobody could be told of a failure
 }
 
 bool Streams::confirm(const std::string &question) const {
@@ -105,7 +108,7 @@ bool Streams::out_is_terminal() const {
 }
 
 bool Streams::err_is_terminal() const {
-    return isatty(STDERR_FILENO) == 1;
+    return isatty(err_) == 1;
 }
 
 Style Streams::style(const std::string &when) const {
@@ -113,6 +116,13 @@ Style Streams::style(const std::string &when) const {
     const bool wanted = out_is_terminal() && !environment_says("NO_COLOR") && !terminal_is_dumb();
     style.colour = when == "always" || (when == "auto" && wanted);
     style.width = out_is_terminal() ? terminal_width(out_) : 0;
+    return style;
+}
+
+Style Streams::message_style() const {
+    Style style;
+    style.colour = err_is_terminal() && !environment_says("NO_COLOR") && !terminal_is_dumb();
+    style.width = err_is_terminal() ? terminal_width(err_) : 0;
     return style;
 }
 

@@ -23,16 +23,21 @@ class Streams {
     // Asks on standard error, reads a line from the real standard input: true for y or yes.
     bool confirm(const std::string &question) const;
 
+    // The real standard error, whatever descriptor 2 has become meanwhile.
+    int err() const { return err_; }
+
     bool can_ask() const; // standard input and error are terminals
     bool out_is_terminal() const;
     bool err_is_terminal() const;
 
     // Colours and width for the real standard output. `when` is auto, always or never.
     Style style(const std::string &when) const;
+    Style message_style() const; // of standard error
 
   private:
     int out_ = -1;
     int in_ = -1;
+    int err_ = -1;
 };
 
 } // namespace zavctl
