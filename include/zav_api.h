@@ -391,7 +391,8 @@ int zavDiskHotRemove(zavDevice *diskdev);
  * Brings the new disk `diskdev` into service. THE DISK IS WIPED. The first active member of
  * /dev/md0 tells the healthy disk whose partition table is copied; the disk is attached if the
  * kernel does not know it yet, marked as the appliance's (bytes 0x4D 0x10 at offset 440) and given
- * to zavAddSWRaidDev. The healthy disk is found through mdadm --detail and udevinfo.
+ * to zavAddSWRaidDev. The healthy disk is found through mdadm --detail and udevinfo. Make sure that
+ * there is a disk: where no node comes up, the tools make a plain file of its name.
  *
  * ZAV_RC_OK          every step ran. The exit statuses of the wiping, copying and marking commands
  *                    are not looked at, nor whether the arrays took the disk: ask zavGetStateRaid.
