@@ -54,7 +54,6 @@ void Command::add(char character) {
         return;
     }
     text_[length_++] = character;
-    text_[length_] = '\0';
 }
 
 void Command::add_word(const char *word, bool in_backquotes) {
@@ -71,14 +70,12 @@ void Command::add_word(const char *word, bool in_backquotes) {
     add('\'');
 }
 
-// Backquotes are unquoted first: there a backslash is needed before each backslash and backquote,
-// between single quotes too.
+// Between backquotes the shell takes one backslash away from each backslash and backquote before it
+// looks at quotation marks.
 void Command::add_quoted(char character, bool in_backquotes) {
     if (character == '\'') { // ends the quotation, adds one, begins another
         add('\'');
         add('\\');
-        if (in_backquotes)
-            add('\\');
         add('\'');
     } else if (in_backquotes && (character == '\\' || character == '`')) {
         add('\\');

@@ -27,7 +27,7 @@ class Command {
     void add_word(const char *word, bool in_backquotes);
     void add_quoted(char character, bool in_backquotes);
 
-    char text_[1024] = "";
+    char text_[1024] = {}; // terminated wherever it ends
     size_t length_ = 0;
     bool valid_ = true;
 };
