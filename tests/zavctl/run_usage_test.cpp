@@ -42,6 +42,8 @@ TEST(RunUsage, MissingAndExtraArgumentsAreRefused) {
     expect_usage({"lv", "show", "1"}, "'1' is no logical volume");
     expect_usage({"pv", "show", "/dev/DataVG1/LogVol1"}, "is no physical volume");
     expect_usage({"vg", "show", "-1"}, "-1");
+    expect_usage({"vg", "add", "array", "3"}, "--group");
+    expect_usage({"vg", "remove"}, "N is required");
     expect_usage({"disk", "remove"}, "N is required");
     expect_usage({"disk", "add", "three"}, "three");
     expect_usage({"disk", "remove", "3", "--force"}, "unknown option '--force'");
@@ -73,6 +75,8 @@ TEST(RunUsage, EveryLevelHasItsHelp) {
                                                           {"vg"},
                                                           {"vg", "list"},
                                                           {"vg", "show"},
+                                                          {"vg", "add"},
+                                                          {"vg", "remove"},
                                                           {"lv"},
                                                           {"lv", "list"},
                                                           {"lv", "show"},

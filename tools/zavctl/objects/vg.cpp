@@ -1,3 +1,4 @@
+#include "group_verbs.h"
 #include "volume_surveys.h"
 
 #include <fmt/format.h>
@@ -41,7 +42,7 @@ Answer group_answer(Session &session, const Machine &machine, const std::vector<
 } // namespace
 
 void add_vg(CLI::App &root, Session &session) {
-    CLI::App *vg = add_object(root, "vg", "The volume groups: list, show");
+    CLI::App *vg = add_object(root, "vg", "The volume groups: list, show, add, remove");
     add_verb(*vg, session, "list", list_help)->callback([&session] {
         session.action = [&session] {
             const Machine machine = read_machine();
@@ -58,6 +59,8 @@ void add_vg(CLI::App &root, Session &session) {
             return group_answer(session, read_machine(), *numbers, "vg show");
         };
     });
+    add_vg_add(*vg, session);
+    add_vg_remove(*vg, session);
 }
 
 } // namespace zavctl

@@ -5,7 +5,9 @@
 #include <cerrno>
 #include <dirent.h>
 #include <fcntl.h>
+#include <filesystem>
 #include <memory>
+#include <sstream>
 #include <unistd.h>
 
 namespace zavctl {
@@ -47,6 +49,21 @@ std::vector<std::string> names_in(const std::string &directory, int &error) {
 bool is_mounted(const std::string &directory) {
     const std::string mounts = read_file("/etc/mtab").text;
     return mounts.find(" " + directory + " ") != std::string::npos;
+}
+
+std::string mounted_at(const std::string &device) {
+    std::error_code error;
+    const std::string target = std::filesystem::canonical(device, error).string();
+    std::istringstream lines(read_file("/etc/mtab").text);
+    for (std::string line; std::getline(lines, line);) {
+        std::istringstream fields(line);
+        std::string source;
+        std::string directory;
+        if (fields >> source >> directory && source.starts_with("/dev/") &&
+            (source == device || std::filesystem::canonical(source, error).string() == target))
+            return directory;
+    }
+    return "";
 }
 
 } // namespace zavctl

@@ -17,4 +17,7 @@ std::vector<std::string> names_in(const std::string &directory, int &error);
 // Whether something is mounted at exactly this directory.
 bool is_mounted(const std::string &directory);
 
+// Where the device, whichever of its names it is mounted by, is mounted; "" if nowhere.
+std::string mounted_at(const std::string &device);
+
 } // namespace zavctl

@@ -126,6 +126,15 @@ std::string mount_point(const zavDevice &volume) {
     return buffer.data();
 }
 
+std::optional<std::string> group_of_device(const std::string &path) {
+    std::array<char, name_size> buffer{};
+    std::string copy = path;
+    if (zavGetPVsVG(copy.data(), buffer.data()) != ZAV_RC_OK)
+        return std::nullopt;
+    const std::string name = buffer.data();
+    return name == "NONE" ? "" : name;
+}
+
 int ata_disk_count() {
     int count = 0;
     return get_diskcount(&count) == ZAV_RC_OK ? count : 0;

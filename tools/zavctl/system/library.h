@@ -54,6 +54,10 @@ RaidAnswer raid_state(const zavDevice &device);
 VolumeAnswer volume_state(const zavDevice &device);
 std::string mount_point(const zavDevice &volume);
 
+// The group of the physical volume on the device, "" for one of none; nothing if the device is no
+// physical volume.
+std::optional<std::string> group_of_device(const std::string &path);
+
 int ata_disk_count(); // 0 if it cannot be told
 
 // What changes the machine: the library's codes.
