@@ -57,8 +57,10 @@ TEST_F(ShellCommand, IsNeverRunWithAWordThatWouldBeAnOption) {
     errno = 0;
     EXPECT_EQ(command.run(), -1);
     EXPECT_EQ(errno, EINVAL);
+    errno = 0;
     const CommandOutput output(command);
     EXPECT_FALSE(output);
+    EXPECT_EQ(errno, EINVAL);
     EXPECT_TRUE(record().commands.empty());
     EXPECT_STREQ(command.text(), "rm -f /scratch/there");
 }
