@@ -1,5 +1,6 @@
 // Is a disk present and healthy?
 #include "common/diag.h"
+#include "common/model.h"
 #include "common/node.h"
 #include "zav_api.h"
 
@@ -8,8 +9,6 @@
 #include <sys/wait.h>
 
 namespace {
-
-constexpr int kKnownModel = 0x300; // every family's code has one of these bits
 
 // What the raw status of the health check means; ZAV_RC_ERR if it could not be run at all.
 int decide_health(int status, int *state) {
@@ -64,22 +63,20 @@ int zavGetStateDisk(zavDevice *dev, zavHddState *info) {
 
 int getDiskStateSATA(zavDevice *dev, zavHddState *info) {
     ZAV_TRACE(zav::kTraceStep, "Enter %s().\n", __func__);
-    int model = 0;
-    int diskmax = 0;
-    int raidcount = 0;
-    if (const int rc = zavGetModelConfig(&model, &diskmax, &raidcount); rc != ZAV_RC_OK) {
+    zav::ModelConfig config;
+    if (const int rc = config.read(); rc != ZAV_RC_OK) {
         ZAV_TRACE(zav::kTraceCommand, "%s() - model[0x%x], diskmax[%d]\n", __func__,
-                  static_cast<unsigned>(model), diskmax);
+                  static_cast<unsigned>(config.model), config.diskmax);
         return rc;
     }
     // Every known model passes, also the one that the message does not name.
-    if ((model & kKnownModel) == 0) {
+    if (!config.is_known()) {
         ZAV_LOG(zav::kAlert, ZAV_RC_ERR_EINVAL,
                 "getDiskStateSATA just be supported on model 2740H|2860. "
                 "Return ZAV_RC_ERR_EINVAL.");
         return ZAV_RC_ERR_EINVAL;
     }
-    if (dev->disk < 1 || dev->disk > diskmax) {
+    if (dev->disk < 1 || dev->disk > config.diskmax) {
         ZAV_LOG(zav::kWarning, ZAV_RC_ERR_EINVAL, "dev->disk(%d) is not acceptable.", dev->disk);
         return ZAV_RC_ERR_EINVAL;
     }

@@ -1,5 +1,6 @@
 // Taking a disk out of service and bringing another in, while the appliance runs.
 #include "common/diag.h"
+#include "common/model.h"
 #include "common/node.h"
 #include "common/owner.h"
 #include "common/shell.h"
@@ -15,7 +16,6 @@ namespace {
 using zav::Command;
 using zav::CommandOutput;
 
-constexpr int kSoftwareRaidModels = 0x300;
 constexpr int kLastPartition = 15;
 constexpr int kAttach = 1;
 constexpr int kDetach = 2;
@@ -32,14 +32,8 @@ struct Workspace {
     char text[1024];
 };
 
-struct Config {
-    int model = 0;
-    int diskmax = 0;
-    int raidcount = 0;
-};
-
-int read_config(const char *function, Config &config) {
-    const int rc = zavGetModelConfig(&config.model, &config.diskmax, &config.raidcount);
+int read_config(const char *function, zav::ModelConfig &config) {
+    const int rc = config.read();
     if (rc != ZAV_RC_OK)
         ZAV_TRACE(zav::kTraceCommand, "%s() - ERR! model[0x%x], diskmax[%d], raidcount[%d]\n",
                   function, static_cast<unsigned>(config.model), config.diskmax, config.raidcount);
@@ -123,7 +117,7 @@ int check_source(Workspace &work) {
     return ZAV_RC_OK;
 }
 
-int remove_disk(Workspace &work, const Config &config) {
+int remove_disk(Workspace &work, const zav::ModelConfig &config) {
     if (work.target.disk < 1 || work.target.disk > config.diskmax)
         return ZAV_RC_ERR_EINVAL;
     if (!find_remaining_disk(work, config.raidcount)) // the last disk of an array stays
@@ -259,10 +253,10 @@ int add_disk(Workspace &work) {
 
 int zavDiskHotRemove(zavDevice *diskdev) {
     ZAV_TRACE(zav::kTraceStep, "Enter %s()\n", __func__);
-    Config config;
+    zav::ModelConfig config;
     if (const int rc = read_config(__func__, config); rc != ZAV_RC_OK)
         return rc;
-    if ((config.model & kSoftwareRaidModels) == 0)
+    if (!config.is_known())
         return refuse(__func__, "Error: Just support Solvane-2860 and Solvane-2740. "
                                 "Return ZAV_RC_ERR_EINVAL.");
     if (const int rc = check_disk(
@@ -285,10 +279,10 @@ int zavDiskHotRemove(zavDevice *diskdev) {
 
 int zavDiskHotAdd(zavDevice *diskdev) {
     ZAV_TRACE(zav::kTraceStep, "Enter %s()\n", __func__);
-    Config config;
+    zav::ModelConfig config;
     if (const int rc = read_config(__func__, config); rc != ZAV_RC_OK)
         return rc;
-    if ((config.model & kSoftwareRaidModels) == 0)
+    if (!config.is_known())
         return refuse(__func__, "just be supported on model 2740H|2860. Return ZAV_RC_ERR_EINVAL.");
     if (diskdev != nullptr && (diskdev->disk < 1 || diskdev->disk > config.diskmax)) {
         ZAV_LOG(zav::kWarning, ZAV_RC_ERR_EINVAL, "diskdev->disk(%d) is not acceptable.",

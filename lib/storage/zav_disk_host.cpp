@@ -1,5 +1,6 @@
 // Attaching and detaching the disks of the motherboard's SATA controller.
 #include "common/diag.h"
+#include "common/model.h"
 #include "common/owner.h"
 #include "common/shell.h"
 #include "common/text.h"
@@ -23,7 +24,6 @@ constexpr const char *kController = "/sys/devices/pci0000:00/0000:00:1f.2";
 constexpr int kMaxHosts = 6; // the controller's ports
 constexpr int kAttach = 1;
 constexpr int kDetach = 2;
-constexpr int kSoftwareRaidModels = 0x300;
 constexpr unsigned kDetachSeconds = 10;
 constexpr unsigned kNodeSeconds = 20; // until the kernel has made the disk's node
 constexpr double kAttachLimit = 30.0;
@@ -214,19 +214,17 @@ int zavSATARescan(zavDevice *dev) {
     ZAV_TRACE(zav::kTraceStep, "Enter %s().\n", __func__);
     if (!is_sata_disk(dev))
         return ZAV_RC_ERR_EINVAL;
-    int model = 0;
-    int diskmax = 0;
-    int raidcount = 0;
-    if (const int rc = zavGetModelConfig(&model, &diskmax, &raidcount); rc != ZAV_RC_OK) {
+    zav::ModelConfig config;
+    if (const int rc = config.read(); rc != ZAV_RC_OK) {
         ZAV_TRACE(zav::kTraceCommand, "%s() - model[0x%x], diskmax[%d]\n", __func__,
-                  static_cast<unsigned>(model), diskmax);
+                  static_cast<unsigned>(config.model), config.diskmax);
         return rc;
     }
-    if ((model & kSoftwareRaidModels) == 0) {
+    if (!config.is_known()) {
         LOG_RESCAN("just be supported on model 2740H|2860. Return ZAV_RC_ERR_EINVAL.");
         return ZAV_RC_ERR_EINVAL;
     }
-    if (dev->disk < 1 || dev->disk > diskmax)
+    if (dev->disk < 1 || dev->disk > config.diskmax)
         return ZAV_RC_ERR_EINVAL;
     char label[128];
     if (const int rc = zavDevToStr(label, sizeof label, dev); rc != ZAV_RC_OK) {

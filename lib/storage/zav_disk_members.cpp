@@ -1,5 +1,6 @@
 // Taking one disk's partitions out of the arrays, and putting another's in.
 #include "common/diag.h"
+#include "common/model.h"
 #include "common/node.h"
 #include "common/owner.h"
 #include "common/shell.h"
@@ -376,18 +377,16 @@ int zavAddSWRaidDev(zavDevice *sdev, zavDevice *tdev) {
         return ZAV_RC_ERR_EINVAL;
     if (zavGetDataRaidtype() == -1)
         return ZAV_RC_ERR;
-    int model = 0;
-    int diskmax = 0;
-    int raidcount = 0;
-    if (const int rc = zavGetModelConfig(&model, &diskmax, &raidcount); rc != ZAV_RC_OK) {
+    zav::ModelConfig config;
+    if (const int rc = config.read(); rc != ZAV_RC_OK) {
         ZAV_TRACE(zav::kTraceCommand, "%s() - model[0x%x], raidcount[%d]\n", __func__,
-                  static_cast<unsigned>(model), raidcount);
+                  static_cast<unsigned>(config.model), config.raidcount);
         return rc;
     }
     const zav::HeapRecord<Output> output;
     if (!output)
         return no_memory(__func__);
-    const int rc = MemberAddition(*sdev, *tdev, raidcount, *output).run();
+    const int rc = MemberAddition(*sdev, *tdev, config.raidcount, *output).run();
     ZAV_TRACE(zav::kTraceStep, "Exit %s().\n", __func__);
     return rc;
 }

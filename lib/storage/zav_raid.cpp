@@ -1,5 +1,6 @@
 // Level, state, members and rebuild progress of an array.
 #include "common/diag.h"
+#include "common/model.h"
 #include "common/node.h"
 #include "common/owner.h"
 #include "common/shell.h"
@@ -12,8 +13,7 @@
 
 namespace {
 
-constexpr int kKnownModel = 0x300; // every family's code has one of these bits
-constexpr int kLine = 80;          // lines are read in pieces of at most 79 characters
+constexpr int kLine = 80; // lines are read in pieces of at most 79 characters
 constexpr int kMaxArrays = 4;
 
 // The state that nothing has been found out for. The members' addresses are given a minor type
@@ -180,7 +180,7 @@ int zavGetStateRaid(zavDevice *dev, zavRaidState *info) {
 
     switch (dev->minor_type) {
     case ZAV_MINDEV_RAID_SW:
-        if ((model & kKnownModel) != 0)
+        if ((model & zav::kKnownModel) != 0)
             return getRaidStateSW(dev, info);
         return refuse(__func__, "Get SW raid state just be supported on model 2740H|2860. "
                                 "Return ZAV_RC_ERR_EINVAL.");
@@ -200,15 +200,13 @@ int zavGetStateRaid(zavDevice *dev, zavRaidState *info) {
 
 int getRaidStateSW(zavDevice *dev, zavRaidState *info) {
     ZAV_TRACE(zav::kTraceStep, "Enter %s()\n", __func__);
-    int model = 0;
-    int diskmax = 0;
-    int members = 0;
-    if (const int rc = zavGetModelConfig(&model, &diskmax, &members); rc != ZAV_RC_OK) {
+    zav::ModelConfig config;
+    if (const int rc = config.read(); rc != ZAV_RC_OK) {
         ZAV_TRACE(zav::kTraceCommand, "%s() - model[0x%x], raidcount[%d]\n", __func__,
-                  static_cast<unsigned>(model), members);
+                  static_cast<unsigned>(config.model), config.raidcount);
         return rc;
     }
-    if ((model & kKnownModel) == 0)
+    if (!config.is_known())
         return refuse(__func__, "just be supported on model 2740H|2860. Return ZAV_RC_ERR_EINVAL.");
 
     *info = undecided(*dev, ZAV_MINDEV_HDD_SATA);
@@ -228,7 +226,7 @@ int getRaidStateSW(zavDevice *dev, zavRaidState *info) {
     snprintf(mdname, sizeof mdname, "md%d", dev->disk - 1);
     ZAV_TRACE(zav::kTraceStep, "%s() - mdname:  %s\n", __func__, mdname);
     int active = 0;
-    rc = read_detail(__func__, mdname, members, info, active);
+    rc = read_detail(__func__, mdname, config.raidcount, info, active);
     return rc == ZAV_RC_OK ? read_mdstat(__func__, mdname, active, info) : rc;
 }
 
