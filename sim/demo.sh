@@ -1,5 +1,6 @@
 #!/usr/bin/env bash
-# A simulated appliance loses a disk and gets it back, seen through zavctl.
+# A simulated appliance loses a disk and gets another, and a volume group comes and goes, all with
+# zavctl. Ends with status 0 if every step came out as announced.
 # usage: sim/demo.sh BUILD-DIRECTORY
 set -euo pipefail
 
@@ -19,51 +20,65 @@ tell() { printf '\n%s# %s%s\n' "$bold" "$*" "$plain"; }
 # Seconds of the reader's clock.
 pause() { sleep $(($1 * scale)); }
 
+fail() {
+    printf 'demo: %s\n' "$*" >&2
+    exit 1
+}
+
 # show EXIT-STATUS COMMAND...: what a user would type and see. The demo ends with an error if the
 # exit status is another one.
 show() {
     local expected=$1 status=0
     shift
     printf '\n%s$ %s%s\n' "$bold" "$*" "$plain"
-    "$@" || status=$?
-    if [ "$status" -ne "$expected" ]; then
-        printf 'demo: exit status %d where %d was expected\n' "$status" "$expected" >&2
-        exit 1
-    fi
+    "$@" 2>&1 || status=$?
+    [ "$status" -eq "$expected" ] || fail "exit status $status where $expected was expected"
     pause 2
 }
 
-tell "A storage appliance with four disks. All is well: exit status 0."
-show 0 zavctl model
+tell "A storage appliance: four disks, three arrays, two volume groups. All is well: exit status 0."
 show 0 zavctl status
 
 tell "Disk 3 begins to die, and the kernel takes it out of its arrays: exit status 2."
 zavsim act disk 3 fails
-show 2 zavctl status
-show 0 grep -A 1 '^md1' /proc/mdstat
-
-tell "It is pulled out. A slot counts as empty after a grace of 20 seconds (of the appliance)."
-zavsim act disk 3 vanishes
 show 2 zavctl disk show 3
-
-tell "A new disk comes in. It is found healthy, but the arrays still lack a member: exit status 1."
-zavsim act disk 3 appears
-show 0 zavctl disk show 3
 show 1 zavctl array list
 
-tell "It joins the arrays, which are rebuilt one after the other."
-zavsim act disk 3 joins
+tell "What would its removal do? Another disk would be a mistake, and is refused."
+show 0 zavctl disk remove 3 --dry-run
+show 2 zavctl disk remove 2 --dry-run
+
+tell "It is taken out of service. What is seen meanwhile is told."
+show 0 zavctl disk remove 3 --yes
+
+tell "It is pulled out, and an empty disk is put in."
+zavsim act disk 3 vanishes
+zavsim act disk 3 appears
+show 0 zavctl disk add 3 --yes
+
+tell "The arrays are rebuilt one after the other, while the volumes stay in use."
 rounds=0
-until zavctl array show 3 >/dev/null; do
+until zavctl array list >/dev/null; do
     printf '\n%s$ zavctl array list%s\n' "$bold" "$plain"
     zavctl array list || true
     rounds=$((rounds + 1))
-    if [ "$rounds" -gt 20 ]; then
-        echo 'demo: the rebuild does not end' >&2
-        exit 1
-    fi
-    pause 3
+    [ "$rounds" -le 20 ] || fail 'the rebuild does not end'
+    pause 4
 done
+show 0 zavctl array list
 
-tell "All is well again."
-show 0 zavctl status
+tell "Array 3 is free: a volume group is made on it, and dismantled again."
+show 0 zavctl vg add array 3 --group 2 --yes
+show 0 zavctl vg list
+show 0 zavctl vg remove 2 --yes
+
+tell "It extends the group of the data array instead."
+show 0 zavctl vg add array 3 --group 1 --yes
+show 0 zavctl pv list
+
+tell "A group that is dismantled takes its volumes with it, so every one is named before."
+show 0 zavctl vg remove 1 --dry-run
+show 0 zavctl vg remove 1 --yes
+
+tell "The data group is missing now, and that is a warning: exit status 1."
+show 1 zavctl status
