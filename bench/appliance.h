@@ -9,6 +9,9 @@ namespace bench {
 extern const std::string detail_text;
 extern const std::string mdstat_text;
 
+// A metadata backup of a group with that many physical and logical volumes.
+std::string backup_text(int physical, int logical);
+
 // Lays down files, device names and tools. False, with a word to the user, outside a private root:
 // the files belong to the system there.
 bool set_up_appliance();

@@ -33,6 +33,19 @@ void read_all(const char *command) {
     require(pclose(output) == 0 && length > 0, command);
 }
 
+// The commands of a volume group's query.
+void read_group(const char * /*they are these*/) {
+    run("/usr/sbin/vgs &> /etc/Kiru/zav/.vgs");
+    run("cat /etc/Kiru/zav/.vgs | grep DataVG1 &>/dev/null");
+    run("/usr/sbin/vgs DataVG1 &>/dev/null");
+    run("/usr/sbin/vgdisplay DataVG1 &> /etc/Kiru/zav/.vgdisplay.DataVG1");
+    read_all("cat /etc/Kiru/zav/.vgdisplay.DataVG1 | grep \"Cur PV\" | cut -c 12- ");
+    read_all("cat /etc/Kiru/zav/.vgdisplay.DataVG1 | grep \"Cur LV\" | cut -c 12- ");
+    read_all("/usr/sbin/vgdisplay -c DataVG1 2>/dev/null | cut -d ':' -f 12");
+    run("/usr/sbin/vgcfgbackup -f /etc/Kiru/zav/DataVG1 DataVG1 &> /dev/null");
+    read_all("echo /dev/`udevinfo -q symlink -p /block/md1`");
+}
+
 // ---- The library's calls. ----
 
 void ask_disk() {
@@ -48,6 +61,14 @@ void ask_array() {
     require(zavGetStateRaid(&array, &info) == ZAV_RC_OK && info.state == ZAV_RAID_NORMAL &&
                 info.raidlevel == ZAV_RAIDLVL_5,
             "zavGetStateRaid");
+}
+
+void ask_group() {
+    zavDevice group = {ZAV_DEV_LVM, ZAV_MINDEV_LVM_VG, 1, 0};
+    zavLVMState info;
+    require(zavgetStateLVMVG(&group, &info) == ZAV_RC_OK && info.state == ZAV_LVM_NORMAL &&
+                info.dev.lvmvgdev.pvdev[0].dev.disk == 2,
+            "zavgetStateLVMVG");
 }
 
 void count_disks() {
@@ -70,6 +91,7 @@ const std::vector<Query> &queries() {
         {"zavGetStateDisk, healthy disk", "smartctl -H -d ata /dev/sata/disk1 &>/dev/null", run,
          ask_disk},
         {"zavGetStateRaid, software array", "/sbin/mdadm --detail /dev/md1", read_all, ask_array},
+        {"zavgetStateLVMVG, one PV", "", read_group, ask_group},
         {"get_diskcount", "cat /proc/scsi/scsi | grep \"Vendor: ATA\" | wc -l", read_all,
          count_disks},
         {"zavMapArcTimeZone",
