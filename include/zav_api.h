@@ -382,8 +382,8 @@ int getRaidStateSAS(zavDevice *dev, zavRaidState *info);
  * 32                 mdadm cannot be started
  * others             as zavGetModelConfig, zavRmSWRaidDev and zavHotCmd return them
  *
- * Blocks 5 seconds and as long as zavRmSWRaidDev does, and about 20 seconds for every empty slot
- * below the first healthy disk.
+ * Blocks 5 seconds and as long as zavRmSWRaidDev does, and about 20 seconds for every empty slot,
+ * the disk's own included, before the first other healthy disk.
  */
 int zavDiskHotRemove(zavDevice *diskdev);
 

@@ -81,14 +81,13 @@ int name_disks(Workspace &work) {
 
 // ---- Removing ----
 
-// The first other disk that is there and healthy.
+// The first other disk that is there and healthy. The disk itself is asked in its turn.
 bool find_remaining_disk(Workspace &work, int slots) {
     for (int slot = 1; slot <= slots; ++slot) {
         zavDevice disk = {ZAV_DEV_HDD, ZAV_MINDEV_HDD_SATA, slot, 0};
         zavHddState info = {};
-        if (slot == work.target.disk)
-            continue;
-        if (zavGetStateDisk(&disk, &info) == ZAV_RC_OK && (info.state & ZAV_HDD_FOUND) != 0) {
+        if (zavGetStateDisk(&disk, &info) == ZAV_RC_OK && (info.state & ZAV_HDD_FOUND) != 0 &&
+            slot != work.target.disk) {
             work.source.disk = slot;
             return true;
         }

@@ -105,15 +105,15 @@ TEST_F(DiskRemoval, WithItsNodesFailsItsMembers) {
 
 TEST_F(DiskRemoval, TakesTheFirstOtherHealthyDiskForTheSource) {
     EXPECT_EQ(remove_disk(1), ZAV_RC_OK);
-    EXPECT_EQ(record().steps, (Steps{health(2), check(2, 1), scan(2, 1), "sleep 5"}));
+    EXPECT_EQ(record().steps, (Steps{health(1), health(2), check(2, 1), scan(2, 1), "sleep 5"}));
     EXPECT_EQ(written(), "scsi remove-single-device 0 0 0 0");
 
     record().steps.clear();
     record().shell->first(health(1), exits(8)); // failing
     record().shell->first(health(2), exits(2)); // not readable
     EXPECT_EQ(remove_disk(3), ZAV_RC_OK);
-    EXPECT_EQ(record().steps,
-              (Steps{health(1), health(2), health(4), check(4, 1), scan(4, 1), "sleep 5"}));
+    EXPECT_EQ(record().steps, (Steps{health(1), health(2), health(3), health(4), check(4, 1),
+                                     scan(4, 1), "sleep 5"}));
 }
 
 TEST_F(DiskRemoval, PassesOverADiskThatCannotBeAsked) {
@@ -131,14 +131,16 @@ TEST_F(DiskRemoval, LooksAtTheModelsDisksOnly) {
     ASSERT_EQ(count, 2);
     record().shell->first(health(2), exits(8));
     EXPECT_EQ(remove_disk(1), ZAV_RC_ERR_EINVAL);
-    EXPECT_EQ(record().steps, Steps{health(2)});
+    EXPECT_EQ(record().steps, (Steps{health(1), health(2)}));
 }
 
 TEST_F(DiskRemoval, OfTheLastDiskIsRefusedWithoutAWord) {
     for (const int slot : {1, 2, 4})
         pull(slot);
     EXPECT_EQ(remove_disk(3), ZAV_RC_ERR_EINVAL);
-    EXPECT_EQ(record().steps, (Steps(6, "sleep 10")));
+    Steps steps(6, "sleep 10");
+    steps.insert(steps.begin() + 4, health(3));
+    EXPECT_EQ(record().steps, steps);
     EXPECT_EQ(written(), "untouched");
     for (const auto &line : record().log)
         EXPECT_EQ(line.ident, "getDiskStateSATA");
