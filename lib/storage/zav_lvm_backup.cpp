@@ -59,9 +59,9 @@ class BackupReader {
         for (Line line = {}; next(line);) {
             if (line.has("extent_size"))
                 read_extent_size(line);
-            if (line.has("physical_volumes") && group_.pvcount > 0)
+            if (line.has("physical_volumes"))
                 read_physical_volumes();
-            if (line.has("logical_volumes") && group_.lvcount > 0)
+            if (line.has("logical_volumes"))
                 read_logical_volumes();
         }
         return result_;

@@ -231,6 +231,7 @@ TEST(Backup, DeviceLinesGiveTheKernelName) {
         {"device = \"/dev/mapper/x-y\"", "mapper/x-y"},
         {"device=\"/dev/md1\"", "md1"},
         {"device = \" /dev/md1\"", "md1"},
+        {"device = \"\t/dev/md1\"", "md1"},
         {"device = \"/dev/md1 md2\"", "md1"},
         {"device = \"/dev/md1\tmd2\"", "md1"},
         {"device = \"/dev/a$(x)`y`;'z\"", "a$(x)`y`;'z"},
