@@ -21,8 +21,9 @@ constexpr const char *root_footer =
     "a command shows.\n\n"
     "Exit status, of every command:\n"
     "  0   all well\n"
-    "  1   warning: an array is degraded or rebuilding\n"
-    "  2   critical: a disk or an array has failed or is missing; an action failed\n"
+    "  1   warning: an array is degraded or rebuilding, a volume is full or inactive\n"
+    "  2   critical: a disk, an array or a volume has failed or is missing; a change failed,\n"
+    "      was not complete, or is refused\n"
     "  3   could not tell: the library or a tool gave no answer to trust, or the output could\n"
     "      not be written\n"
     "  64  wrong usage: nothing was asked, nothing was done\n"
@@ -31,6 +32,8 @@ constexpr const char *root_footer =
     "  zavctl status                      the whole appliance on one screen\n"
     "  zavctl disk list                   every disk\n"
     "  zavctl array show 2                one array in detail\n"
+    "  zavctl lv list                     every volume, how full, and where it is mounted\n"
+    "  zavctl disk remove 3 --dry-run     what taking a disk out would do\n"
     "  zavctl name /dev/sata/disk3p2      a path as an address\n"
     "  zavctl doctor                      is this system fit for the library?";
 

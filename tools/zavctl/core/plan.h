@@ -20,7 +20,7 @@ struct PlanStep {
 // A reason not to begin. One with an option is the user's to decide.
 struct Refusal {
     std::string text;
-    std::string option = ""; // "--recreate": given, this is no refusal
+    std::string option{}; // "--recreate": given, this is no refusal
 };
 
 struct Plan {

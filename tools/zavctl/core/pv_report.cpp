@@ -27,7 +27,7 @@ Finding finding(const PvReport &pv) {
 std::string device_text(const PvReport &pv) {
     if (pv.failure && pv.device.device.disk == 0)
         return "-";
-    const std::string words = device_words(pv.device);
+    std::string words = device_words(pv.device);
     if (pv.device.device.disk == 0 || pv.device.path.empty() || words == pv.device.path)
         return words;
     return fmt::format("{} ({})", words, pv.device.path);
