@@ -105,6 +105,7 @@ TEST(RunVolume, ADeviceWithoutAnAddressCannotBeTold) {
 }
 
 TEST(RunVolume, ManyAtOnceDoNotDisturbEachOther) {
-    const Outcome run = on_zav("for i in 1 2 3 4 5 6; do zavctl status >/dev/null; echo $?; done");
+    const Outcome run = on_zav("for i in {1..6}; do { zavctl status >/dev/null; echo $?; } & done; "
+                               "wait");
     EXPECT_EQ(run.out, "0\n0\n0\n0\n0\n0\n");
 }

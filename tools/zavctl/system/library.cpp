@@ -1,7 +1,7 @@
 #include "library.h"
 
 #include <array>
-#include <mutex>
+#include <csignal>
 
 namespace zavctl::library {
 
@@ -51,6 +51,24 @@ std::optional<std::string> identity(int (*read)(char *, int)) {
         return std::nullopt;
     return std::string(buffer.data());
 }
+
+// These queries wait for a lock between processes. The end of a tool that another thread has
+// started would wake this one up, and the wait would count as failed.
+class ChildSignalBlocked {
+  public:
+    ChildSignalBlocked() {
+        sigset_t set;
+        sigemptyset(&set);
+        sigaddset(&set, SIGCHLD);
+        pthread_sigmask(SIG_BLOCK, &set, &before_);
+    }
+    ~ChildSignalBlocked() { pthread_sigmask(SIG_SETMASK, &before_, nullptr); }
+    ChildSignalBlocked(const ChildSignalBlocked &) = delete;
+    ChildSignalBlocked &operator=(const ChildSignalBlocked &) = delete;
+
+  private:
+    sigset_t before_{};
+};
 
 } // namespace
 
@@ -107,12 +125,7 @@ RaidAnswer raid_state(const zavDevice &device) {
 }
 
 VolumeAnswer volume_state(const zavDevice &device) {
-    // These hold a lock between processes. A thread that waits for it is woken up by the end of
-    // another's tool, and the wait counts as failed: wait here instead.
-    static std::mutex one_at_a_time;
-    std::unique_lock lock(one_at_a_time, std::defer_lock);
-    if (device.minor_type != ZAV_MINDEV_LVM_LV)
-        lock.lock();
+    const ChildSignalBlocked blocked;
     VolumeAnswer answer;
     zavDevice copy = device;
     answer.result = zavGetStateLVM(&copy, &answer.state);
