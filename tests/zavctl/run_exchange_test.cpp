@@ -217,6 +217,18 @@ TEST(RunExchange, AFailedDataArrayIsCreatedAnewWithConsentOnly) {
     EXPECT_TRUE(holds(without.out, "--recreate")) << without.out;
 }
 
+TEST(RunExchange, ADestroyedDataArrayComesBackEmptyWithConsent) {
+    const Outcome run =
+        on_zav("zavctl disk remove 3 --yes --destroy-data >/dev/null 2>&1; "
+               "zavctl disk add 3 --yes; zavctl disk add 3 --yes --recreate; status=$?; "
+               "zavctl vg show 1 >/dev/null && exit $status",
+               {"--level", "raid0"});
+    EXPECT_EQ(run.status, 0) << run.out << run.err;
+    EXPECT_TRUE(holds(run.out, "--recreate makes it anew")) << run.out;
+    EXPECT_TRUE(holds(run.out, "OK: disk 3 is in arrays 1, 2 and 3.")) << run.out;
+    EXPECT_TRUE(holds(run.err, " s  md1 runs\n")) << run.err;
+}
+
 TEST(RunExchange, AnInterruptDoesNotStopAChange) {
     const Outcome run = on_zav("zavsim act disk 3 fails; zavctl disk remove 3 --yes & pid=$!; "
                                "until ! grep -q sdc3 /proc/mdstat; do :; done; "
