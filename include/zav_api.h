@@ -169,7 +169,7 @@ int set_semvalue(int sem_id, int key);
 int del_semvalue(int sem_id, int key);
 
 /** Takes the lock, waiting for as long as it is held. The kernel gives it back if the holder
- *  dies. Not recursive. */
+ *  dies. Not recursive. A signal that the program handles ends the wait (128); SIGCHLD waits. */
 int semaphore_p(int sem_id, int key);
 
 /** Releases the lock. Releasing one that is not held is logged and done all the same: the value

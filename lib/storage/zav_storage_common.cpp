@@ -4,6 +4,7 @@
 #include "zav_private.h"
 
 #include <cerrno>
+#include <csignal>
 #include <cstring>
 #include <sys/ipc.h>
 #include <sys/sem.h>
@@ -20,6 +21,24 @@ constexpr int kLogNumber = 3;
         ZAV_LOG(zav::kAlert, kLogNumber, format, static_cast<unsigned>(key), sem_id, error,        \
                 strerror(error));                                                                  \
     } while (false)
+
+// Holds SIGCHLD back from this thread. Where another thread runs a command, which it does with
+// SIGCHLD blocked, the signal of its child would end this thread's wait.
+class ChildSignalHeld {
+  public:
+    ChildSignalHeld() {
+        sigset_t child;
+        sigemptyset(&child);
+        sigaddset(&child, SIGCHLD);
+        pthread_sigmask(SIG_BLOCK, &child, &before_);
+    }
+    ChildSignalHeld(const ChildSignalHeld &) = delete;
+    ChildSignalHeld &operator=(const ChildSignalHeld &) = delete;
+    ~ChildSignalHeld() { pthread_sigmask(SIG_SETMASK, &before_, nullptr); }
+
+  private:
+    sigset_t before_ = {};
+};
 
 // The kernel takes the step back if this process dies before it does so itself.
 bool change_value(int sem_id, short step) {
@@ -74,6 +93,7 @@ int del_semvalue(int sem_id, int key) {
 int semaphore_p(int sem_id, int key) {
     int value;
     semaphore_getvalue(sem_id, key, &value);
+    const ChildSignalHeld held;
     if (!change_value(sem_id, -1)) {
         LOG_FAILURE("Failed to Lock Semaphore. key[0x%x] sem_id[%d] errno[%d][%s]\n", key, sem_id);
         return ZAV_RC_ERR;

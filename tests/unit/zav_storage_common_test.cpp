@@ -182,4 +182,39 @@ TEST_F(Locks, ANullValuePointerIsRefused) {
     EXPECT_EQ(semaphore_getvalue(get(), kKey, nullptr), 128);
 }
 
+// As system() and popen() do in another thread: with SIGCHLD blocked there, the signal goes to
+// whichever thread has it not.
+TEST_F(Locks, AreWaitedForWhileOtherThreadsRunCommands) {
+    const int id = get();
+    ASSERT_EQ(semaphore_p(id, kKey), 0);
+    int taken = -1;
+    std::thread waiter([&] { taken = semaphore_p(id, kKey); });
+    while (semctl(id, 0, GETNCNT) == 0)
+        std::this_thread::yield();
+    sigset_t child;
+    sigemptyset(&child);
+    sigaddset(&child, SIGCHLD);
+    sigset_t before;
+    pthread_sigmask(SIG_BLOCK, &child, &before);
+    for (int i = 0; i < 20; ++i)
+        in_child([] { return 0; });
+    pthread_sigmask(SIG_SETMASK, &before, nullptr);
+    EXPECT_EQ(semaphore_v(id, kKey), 0);
+    waiter.join();
+    EXPECT_EQ(taken, 0);
+    EXPECT_EQ(value(id), 0);
+    sigset_t now;
+    pthread_sigmask(SIG_SETMASK, nullptr, &now);
+    EXPECT_EQ(sigismember(&now, SIGCHLD), 0);
+    EXPECT_TRUE(record().log.empty());
+}
+
+TEST_F(Locks, LeaveTheSignalMaskAsItWas) {
+    const int id = get();
+    ASSERT_EQ(semaphore_p(id, kKey), 0);
+    sigset_t now;
+    pthread_sigmask(SIG_SETMASK, nullptr, &now);
+    EXPECT_EQ(sigismember(&now, SIGCHLD), 0);
+}
+
 } // namespace
