@@ -188,12 +188,13 @@ void publish_scsi(const std::string &list, const std::string &taken_command) {
 
 void publish(const State &state, const std::string &taken_command) {
     write_text("/proc/mdstat", mdstat_text(state));
-    publish_scsi(scsi_text(state), taken_command);
     publish_devices(state);
     publish_labels(state);
     publish_ports(state);
     publish_mounts(state);
     publish_tools(state);
+    // The last: who waits for a command to be done looks for the list in its place.
+    publish_scsi(scsi_text(state), taken_command);
 }
 
 } // namespace zavsim

@@ -285,6 +285,14 @@ TEST(Backup, OddNumbersAreTakenAsScanned) {
     EXPECT_EQ(lv_number("LogVol99999999999"), INT_MAX);
 }
 
+TEST(Backup, EntriesBeginWhereNameAndBraceStandInOneLine) {
+    const Parsed parsed = parse(kPhysical + "pv0 {\npv5\nother {\n}\n}\n" + kLogical +
+                                    "LogVol1 {\nLogVol5\nother {\n}\n}\n",
+                                1, 1);
+    EXPECT_EQ(parsed.group.pvdev[0].lvmdev.disk, 1);
+    EXPECT_EQ(parsed.measured, std::vector{1});
+}
+
 TEST(Backup, ThatIsCutOffGivesWhatIsThere) {
     const std::string whole = harness::data("captures/lvm-commands/vgcfgbackup-file-DataVG2.txt");
     for (size_t length = 0; length < whole.size(); length += 7) {

@@ -1,7 +1,6 @@
 #include "library.h"
 
 #include <array>
-#include <csignal>
 
 namespace zavctl::library {
 
@@ -51,24 +50,6 @@ std::optional<std::string> identity(int (*read)(char *, int)) {
         return std::nullopt;
     return std::string(buffer.data());
 }
-
-// These queries wait for a lock between processes. The end of a tool that another thread has
-// started would wake this one up, and the wait would count as failed.
-class ChildSignalBlocked {
-  public:
-    ChildSignalBlocked() {
-        sigset_t set;
-        sigemptyset(&set);
-        sigaddset(&set, SIGCHLD);
-        pthread_sigmask(SIG_BLOCK, &set, &before_);
-    }
-    ~ChildSignalBlocked() { pthread_sigmask(SIG_SETMASK, &before_, nullptr); }
-    ChildSignalBlocked(const ChildSignalBlocked &) = delete;
-    ChildSignalBlocked &operator=(const ChildSignalBlocked &) = delete;
-
-  private:
-    sigset_t before_{};
-};
 
 } // namespace
 
@@ -125,7 +106,6 @@ RaidAnswer raid_state(const zavDevice &device) {
 }
 
 VolumeAnswer volume_state(const zavDevice &device) {
-    const ChildSignalBlocked blocked;
     VolumeAnswer answer;
     zavDevice copy = device;
     answer.result = zavGetStateLVM(&copy, &answer.state);
