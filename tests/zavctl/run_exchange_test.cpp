@@ -51,7 +51,8 @@ TEST(RunExchange, ANewDiskJoinsTheArrays) {
     EXPECT_EQ(run.status, 0) << run.err;
     EXPECT_TRUE(run.out.starts_with("OK: disk 3 is in arrays 1, 2 and 3.")) << run.out;
     EXPECT_TRUE(holds(run.err, " s  disk3p2 is in md1\n")) << run.err;
-    for (const nlohmann::json &array : parsed(run.out.substr(run.out.find('{')))["arrays"])
+    const nlohmann::json answer = parsed(run.out.substr(run.out.find('{')));
+    for (const nlohmann::json &array : answer["arrays"])
         EXPECT_EQ(array["members"][2]["state"], "active") << array;
 }
 
