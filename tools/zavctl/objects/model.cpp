@@ -22,7 +22,7 @@ constexpr VerbHelp help = {
 
 std::string missing_volume_tool() {
     for (const char *name : {"vgs", "lvs", "pvs", "vgdisplay", "lvdisplay", "pvdisplay"}) {
-        const std::string path = std::string("/usr/sbin/") + name;
+        std::string path = std::string("/usr/sbin/") + name;
         if (find_tool(path).empty())
             return path;
     }

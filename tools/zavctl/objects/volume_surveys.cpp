@@ -140,6 +140,15 @@ Named named(const std::vector<GroupReport> &groups, std::vector<int> GroupReport
     return result;
 }
 
+template <class Id, class MakeQuestion>
+std::vector<Question> questions_of(const std::vector<Id> &ids, const MakeQuestion &make) {
+    std::vector<Question> questions;
+    questions.reserve(ids.size());
+    for (const Id &id : ids)
+        questions.push_back(make(id));
+    return questions;
+}
+
 bool has_arrays(const Machine &machine) {
     return machine.model.known() && !machine.model.hardware_raid() && machine.model.disk_count > 1;
 }
@@ -161,29 +170,26 @@ std::vector<int> listed_groups(const Machine &machine) {
 
 std::vector<Question> ask_groups(const Machine &machine, const std::vector<int> &numbers,
                                  const Session &session, const Shared<GroupReport> &reports) {
-    std::vector<Question> questions;
-    for (const int number : numbers)
-        questions.push_back(question("group " + group_name(number), machine,
-                                     unanswered_group(machine, number, session), reports));
-    return questions;
+    return questions_of(numbers, [&](int number) {
+        return question("group " + group_name(number), machine,
+                        unanswered_group(machine, number, session), reports);
+    });
 }
 
 std::vector<Question> ask_volumes(const Machine &machine, const std::vector<VolumeId> &ids,
                                   const Session &session, const Shared<VolumeReport> &reports) {
-    std::vector<Question> questions;
-    for (const VolumeId &id : ids)
-        questions.push_back(question("volume " + in_words(id), machine,
-                                     unanswered_volume(machine, id, session), reports));
-    return questions;
+    return questions_of(ids, [&](const VolumeId &id) {
+        return question("volume " + in_words(id), machine, unanswered_volume(machine, id, session),
+                        reports);
+    });
 }
 
 std::vector<Question> ask_pvs(const Machine &machine, const std::vector<VolumeId> &ids,
                               const Session &session, const Shared<PvReport> &reports) {
-    std::vector<Question> questions;
-    for (const VolumeId &id : ids)
-        questions.push_back(question("physical volume " + in_words(id), machine,
-                                     unanswered_pv(machine, id, session), reports));
-    return questions;
+    return questions_of(ids, [&](const VolumeId &id) {
+        return question("physical volume " + in_words(id), machine,
+                        unanswered_pv(machine, id, session), reports);
+    });
 }
 
 Named volumes_of(const std::vector<GroupReport> &groups) {
