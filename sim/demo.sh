@@ -4,7 +4,7 @@
 # usage: sim/demo.sh BUILD-DIRECTORY
 set -euo pipefail
 
-scale=15 # appliance seconds in a second
+scale=20 # appliance seconds in a second
 
 if [ $# -eq 1 ]; then
     build=$(cd "$1" && pwd)
