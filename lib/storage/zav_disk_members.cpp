@@ -265,8 +265,9 @@ class MemberAddition {
         if ((state & (ZAV_RAID_DEGRADED | ZAV_RAID_RESYNC)) != 0)
             return add_member(query.array, target.text);
         const bool lost = state == ZAV_RAID_FAILED || state == ZAV_RAID_NOT_EXIST;
-        if (lost && disks == raidcount_ && raidcount_ >= 2 && raidcount_ <= 4)
-            return create_anew(query, target.text, state == ZAV_RAID_FAILED);
+        char form[zav::kLongestCreation];
+        if (lost && disks == raidcount_ && zav::creation_form(form, raidcount_))
+            return create_anew(form, query, target.text, state == ZAV_RAID_FAILED);
         return true;
     }
 
@@ -312,13 +313,10 @@ class MemberAddition {
         return true;
     }
 
-    // Whichever array it was: only the data array is ever created anew, from partitions 2.
-    bool create_anew(const ArrayQuery &query, const char *member, bool running) {
+    bool create_anew(const char *form, const ArrayQuery &query, const char *member, bool running) {
         if (running)
             Command("mdadm --stop %s &>/dev/null", {query.array}).run();
         Command("/bin/dd if=/dev/zero of=%s bs=1M count=1 &>/dev/null", {member}).run();
-        char form[256];
-        creation_form(form);
         const Command create(form, {query.array, query.level});
         ZAV_TRACE(zav::kTraceStep, "%s() - pcmd: %s\n", kAdd, create.text());
         CommandOutput pipe(create);
@@ -329,18 +327,6 @@ class MemberAddition {
         restore_volumes();
         result_ = ZAV_RC_OK;
         return true;
-    }
-
-    void creation_form(char (&form)[256]) const {
-        char members[96] = "";
-        size_t length = 0;
-        for (int disk = 1; disk <= raidcount_; ++disk)
-            length += static_cast<size_t>(
-                snprintf(members + length, sizeof members - length, " /dev/sata/disk%dp2", disk));
-        snprintf(form, sizeof form,
-                 "echo 'y' | mdadm --create %%s --force --level=%%s --raid-devices=%d "
-                 "--metadata=1.2 --name=MD1%s &>/dev/null",
-                 raidcount_, members);
     }
 
     bool stop_without_pipe() {

@@ -2,6 +2,7 @@
 
 #include "common/text.h"
 
+#include <cstdio>
 #include <cstring>
 
 namespace zav {
@@ -50,6 +51,21 @@ bool read_member_numbers(char *row, DeviceNumbers &numbers) {
     if (minor == nullptr)
         return false;
     numbers = {to_int(major), to_int(minor)};
+    return true;
+}
+
+bool creation_form(char (&form)[kLongestCreation], int disks) {
+    if (disks < 2 || disks > 4)
+        return false;
+    char members[96] = "";
+    size_t length = 0;
+    for (int disk = 1; disk <= disks; ++disk)
+        length += static_cast<size_t>(
+            snprintf(members + length, sizeof members - length, " /dev/sata/disk%dp2", disk));
+    snprintf(form, sizeof form,
+             "echo 'y' | mdadm --create %%s --force --level=%%s --raid-devices=%d "
+             "--metadata=1.2 --name=MD1%s &>/dev/null",
+             disks, members);
     return true;
 }
 

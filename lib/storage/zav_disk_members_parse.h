@@ -1,5 +1,8 @@
-// What mdadm says of the array that a partition belongs to, and of a faulty member.
+// What mdadm says of the array that a partition belongs to, and of a faulty member; and what it is
+// told to create an array anew.
 #pragma once
+
+#include <cstddef>
 
 namespace zav {
 
@@ -21,5 +24,12 @@ struct DeviceNumbers {
 
 // From a row of mdadm's device table; false if it has no such columns. Takes the row apart.
 bool read_member_numbers(char *row, DeviceNumbers &numbers);
+
+constexpr size_t kLongestCreation = 256;
+
+// The command's form, with places for the array's name and its level, for a model of two to four
+// disks; false, and nothing written, for another number. Whichever array it is, the members are the
+// partitions 2 and the name is MD1: only the data array is ever created anew.
+bool creation_form(char (&form)[kLongestCreation], int disks);
 
 } // namespace zav

@@ -72,6 +72,26 @@ TEST(NumbersOfAMember, AreTheSecondAndThirdColumn) {
     EXPECT_EQ(numbers("4 8"), "none");
 }
 
+TEST(Creation, IsMadeOfPartition2OfEveryDisk) {
+    const std::string begin = "echo 'y' | mdadm --create %s --force --level=%s --raid-devices=";
+    const std::string middle = " --metadata=1.2 --name=MD1 /dev/sata/disk1p2 /dev/sata/disk2p2";
+    char form[zav::kLongestCreation];
+    ASSERT_TRUE(zav::creation_form(form, 2));
+    EXPECT_EQ(form, begin + "2" + middle + " &>/dev/null");
+    ASSERT_TRUE(zav::creation_form(form, 3));
+    EXPECT_EQ(form, begin + "3" + middle + " /dev/sata/disk3p2 &>/dev/null");
+    ASSERT_TRUE(zav::creation_form(form, 4));
+    EXPECT_EQ(form, begin + "4" + middle + " /dev/sata/disk3p2 /dev/sata/disk4p2 &>/dev/null");
+}
+
+TEST(Creation, IsKnownForTwoToFourDisks) {
+    for (const int disks : {-1, 0, 1, 5, 1000}) {
+        char form[zav::kLongestCreation] = "untouched";
+        EXPECT_FALSE(zav::creation_form(form, disks));
+        EXPECT_STREQ(form, "untouched");
+    }
+}
+
 // ---- Taking out ----
 
 constexpr zavDevice kSource = {ZAV_DEV_HDD, ZAV_MINDEV_HDD_SATA, 1, 0};
@@ -715,23 +735,14 @@ TEST_F(MemberAddition, CreatesAMissingArrayAnewWithoutStoppingIt) {
     EXPECT_EQ(changes(), (Steps{scan(1), scan(2), kDd, create("raid10", 4), "sleep 10", kRestore}));
 }
 
-TEST_F(MemberAddition, CreatesFromTheModelsDisks) {
-    for (const int disks : {2, 3}) {
-        model(disks == 2 ? "SV-2740\n" : "SV-2860\n",
-              "raidtype=1;0;" + std::to_string(disks) + "\n");
-        int known = 0;
-        int slots = 0;
-        int count = 0;
-        if (zavGetModelConfig(&known, &slots, &count) != ZAV_RC_OK || count != disks)
-            continue; // no model of three disks
-        record().steps.clear();
-        record().shell->first(scan(1), prints("nothing\n"));
-        record().shell->first(scan(2), array("/dev/md/MD1", "raid0"));
-        record().shell->first("/proc/scsi/scsi", prints(std::to_string(disks) + "\n"));
-        put("/proc/mdstat", "unused devices: <none>\n");
-        EXPECT_EQ(add_members(), ZAV_RC_OK);
-        EXPECT_EQ(changes()[3], create("raid0", disks));
-    }
+TEST_F(MemberAddition, CreatesFromTheDisksOfATwoDiskModel) {
+    two_disk_model();
+    record().shell->first(scan(1), prints("nothing\n"));
+    record().shell->first(scan(2), array("/dev/md/MD1", "raid0"));
+    record().shell->first("/proc/scsi/scsi", prints("2\n"));
+    put("/proc/mdstat", "unused devices: <none>\n");
+    EXPECT_EQ(add_members(), ZAV_RC_OK);
+    EXPECT_EQ(changes(), (Steps{scan(1), scan(2), kDd, create("raid0", 2), "sleep 10", kRestore}));
 }
 
 TEST_F(MemberAddition, TakesPartitions2AndMd1WhicheverArrayItIs) {
