@@ -300,23 +300,34 @@ char *getTableEntrySMBIOS(int type);
 
 /**
  * Is this disk present and healthy? `dev` is a whole disk (no partition) of minor type
- * ZAV_MINDEV_HDD_SATA, _HWSATA or _SAS. Presence is told by the device node, health by the exit
- * status of "smartctl -H -d ata".
+ * ZAV_MINDEV_HDD_SATA, _HWSATA or _SAS.
+ *
+ * On the motherboard (SATA) presence is told by the device node, health by the exit status of
+ * "smartctl -H -d ata". Disks of the RAID controller (HWSATA, slots 1 to 4, model 2980 only) and of
+ * an expansion unit (SAS: unit 1 to 7 in bits 8 to 15 of `disk`, slot 1 to 4 in the rest) are looked
+ * up in the controller's report, see updateData.
  *
  * ZAV_RC_OK          info->state is ZAV_HDD_FOUND, _ABSENT or _FAILED; smartctl's exit status 2
- *                    (cannot open the device) is absent, every other but 0 is failed
+ *                    (cannot open the device) is absent, every other but 0 is failed. From the
+ *                    report: the status it gives, as it stands; ABSENT for a disk without a size
+ *                    (a SAS disk then has info->dev.type 0) and for an enclosure that the report
+ *                    does not have.
  * ZAV_RC_ERR_EINVAL  null pointer, type or partition (record untouched); minor type, model without
- *                    such disks or slot number (record filled with state 0)
+ *                    such disks or slot number (record filled with state 0; a SAS disk's with
+ *                    ZAV_HDD_FOUND)
  * 0x1301             no known model; state 0
  * ZAV_RC_ERR         the node is there but not accessible (state ZAV_HDD_ABSENT), or no shell
  *                    could be started (state 0)
+ * others             as updateData returns them; state ZAV_HDD_FOUND, which then means nothing
  *
- * Blocks about 20 seconds for an empty slot: a missing node is looked for three times, 10 seconds
- * apart, so that a disk just inserted is found. Otherwise as long as smartctl takes.
+ * Blocks about 20 seconds for an empty slot on the motherboard: a missing node is looked for three
+ * times, 10 seconds apart, so that a disk just inserted is found. Otherwise as long as smartctl
+ * takes, or until the report is free.
  */
 int zavGetStateDisk(zavDevice *dev, zavHddState *info);
 
-/** Readers by minor type. `info` comes with everything but the state filled in. */
+/** Readers by minor type. `info` comes with everything but the state filled in; those of the
+ *  report fill the rest themselves too. Null pointers: ZAV_RC_ERR_EINVAL from those. */
 int getDiskStateSATA(zavDevice *dev, zavHddState *info);
 int getDiskStateHWSATA(zavDevice *dev, zavHddState *info);
 int getDiskStateSAS(zavDevice *dev, zavHddState *info);
@@ -329,32 +340,181 @@ int getDiskStateSAS(zavDevice *dev, zavHddState *info);
  * of every disk of the model. The answer comes from "mdadm --detail" and /proc/mdstat. For an
  * iSCSI target {.., ZAV_MINDEV_RAID_ISCSI, n, 0} only the device node is looked for.
  *
+ * A volume of the RAID controller is {.., ZAV_MINDEV_RAID_HW, n, 0} with n 1 or 2, on model 2980;
+ * an expansion unit's is {.., ZAV_MINDEV_RAID_SAS, unit << 8 | 1, 0}. Its device node must be
+ * there; everything else comes from the controller's report, see updateData.
+ *
  * The state of a software array is one of ZAV_RAID_NORMAL, _DEGRADED, _FAILED, _RESYNC (a rebuild
  * runs or waits; it replaces the others) and _NOT_EXIST. A mirror is never FAILED. `resync` is the
  * progress in whole percent, 100 for levels without redundancy. `raidcount` and `hdddev` give the
  * model's full layout, lost members included. An iSCSI target that exists has state 0.
  *
+ * State, `resync` and `raidcount` (disks of the RAID set) of a volume are the report's numbers as
+ * they stand. Its level is ZAV_RAIDLVL_5 for the report's level 3, ZAV_RAIDLVL_1 for level 1
+ * (ZAV_RAIDLVL_10 in a set of four), else ZAV_RAIDLVL_0. `hdddev` has the enclosure's four slots; one
+ * whose disk has no size has type and minor type 0. ZAV_RAID_NOT_EXIST if the node or the report's
+ * section is missing. The report is read once for the volume and again for every disk: between
+ * these it may be rewritten.
+ *
  * ZAV_RC_OK          as above; ZAV_RAID_NOT_EXIST comes with level ZAV_RAIDLVL_NONE
  * ZAV_RC_ERR_EINVAL  null pointer, types or model (record untouched); array or partition number
- *                    (filled, state 0; untouched for iSCSI); a RAID level the appliance does not
- *                    build, such as RAID6, or none told (filled, level NONE)
+ *                    (filled, state 0; untouched for iSCSI, for the controller's volumes and for
+ *                    a unit's partition); a RAID level the appliance does not build, such as
+ *                    RAID6, or none told (filled, level NONE)
  * 0x1301             no known model; record untouched
  * ZAV_RC_ERR_ENOENT  /proc/mdstat cannot be opened; level filled
  * ZAV_RC_ERR         mdadm cannot be started; the node is there but not accessible (state
  *                    ZAV_RAID_NOT_EXIST); or the array's third line in /proc/mdstat is none the
  *                    appliance's kernel writes (a bitmap, a check, a pending resync): level and
  *                    state are filled, the members are not
+ * others             as updateData returns them; state 0
  *
  * Blocks about 20 seconds for a missing node, see zavGetStateDisk. Otherwise as long as mdadm
- * takes.
+ * takes, or until the report is free.
  */
 int zavGetStateRaid(zavDevice *dev, zavRaidState *info);
 
-/** Readers by minor type; they fill the whole record. */
+/** Readers by minor type; they fill the whole record. getRaidStateHW answers on every model. */
 int getRaidStateSW(zavDevice *dev, zavRaidState *info);
 int getRaidStateISCSI(zavDevice *dev, zavRaidState *info);
 int getRaidStateHW(zavDevice *dev, zavRaidState *info);
 int getRaidStateSAS(zavDevice *dev, zavRaidState *info);
+
+/* ==== RAID controller and expansion units =====================================================
+ *
+ * An agent on the appliance writes what the RAID controller knows into /etc/Kiru/zav/.raidinfo: a
+ * section for the controller itself ("PCI") and one for each expansion unit ("RBOD#1" to
+ * "RBOD#7"). It and these functions take turns by the semaphore 0x6912: as long as somebody holds
+ * it they wait, without a limit. They may be called from several threads at once.
+ */
+
+/**
+ * What the report says of the enclosure that holds `dev`: RAID set, volumes, disks. The controller
+ * for minor types ZAV_MINDEV_HDD_HWSATA and ZAV_MINDEV_RAID_HW, an expansion unit (bits 8 to 15 of
+ * `disk`) for ZAV_MINDEV_HDD_SAS and ZAV_MINDEV_RAID_SAS; the other fields are not looked at.
+ *
+ * Sizes, levels and statuses are the report's own numbers. Volume n stands in sVolInfo[n-1], disk n
+ * in sDiskInfo[n-1]; a volume that the report lacks is all zero, a disk has its number alone. The
+ * set's `status` and the volumes' `scsiId` are not filled. At most six volumes and four disks of a
+ * section are read.
+ *
+ * The section runs from the first line that contains the marker anywhere ("RBOD#1" is also found in
+ * "RBOD#12") to the first that contains "H:". Without one, what follows counts too: the last RAID
+ * set wins. Lines are read in pieces of 79 characters; a field of more than 15 runs into the next
+ * of its line; names are cut to fit. A volume numbered 0 lands on the set's own fields, a disk
+ * numbered 0 or less on the last volumes; a number that would land outside the record is ignored.
+ *
+ * ZAV_RC_OK                  filled
+ * ZAV_RC_ERR_EINVAL          null pointer; minor type, unit number
+ * ZAV_RC_ERR                 the semaphore cannot be had (logged)
+ * ZAV_RC_ERR_READINFOFAIL    the report cannot be opened (logged)
+ * ZAV_RC_ERR_ENODEV          no such section, or no RAID set in it
+ *
+ * In every failure the record is all zero.
+ */
+int updateData(zavDevice *dev, sRaidSetInfo *pRaidInfo);
+
+/**
+ * One reading of the hardware monitor: of an expansion unit (items 0 to 4; 0 is the temperature of
+ * its processor in degrees Celsius, 4 that processor's voltage in volts), or of the controller card
+ * (items 0 to 3). It is taken from the first line behind the enclosure's marker that begins with
+ * "H": a section without one is given the next section's.
+ *
+ * ZAV_RC_OK          `*value` is the reading; 0 if the line has fewer. A unit without any monitor
+ *                    line behind its marker reads 0 as well.
+ * ZAV_RC_ERR_EINVAL  null pointer; no such item, `*value` is then 0. The item is looked at last.
+ * ZAV_RC_ERR         the semaphore cannot be had (logged)
+ * ZAV_RC_ERR_ENOENT  the report cannot be opened
+ * ZAV_RC_ERR_ENODEV  the report does not have this enclosure, or has no monitor line for the
+ *                    controller card
+ *
+ * But for a wrong item `*value` is untouched in every failure.
+ */
+int zavGetRBODHwMon(int rbodid, int item, float *value);
+int zavGetRaidCardHwMon(int item, double *value);
+
+/**
+ * The expansion units that hang behind the controller now, unit n in element n-1: address, serial
+ * number, model, numbers of the neighbours (parentid 0 is the controller, -1 means no unit on that
+ * link; the numbers follow the place in the cascade: n/2 above, 2n and 2n+1 below). The list of units
+ * and addresses is also written to /etc/Kiru/zav/.RBODinfo; a disk too full for it is not
+ * reported.
+ *
+ * The cascade is what /usr/bin/query_sas.sh prints, of which at most seven expanders are taken; one
+ * that unit 1 does not lead to, or that would be numbered above 7, is left out. Serial number and
+ * model come from the report and are empty where it does not have the unit.
+ *
+ * The record is filled with bytes 0xFF first. An element without a unit has iExist 0 and stays so in
+ * the rest.
+ *
+ * ZAV_RC_OK          filled; no units at all, and a script that is missing or prints nothing, are
+ *                    no failure
+ * ZAV_RC_ERR_EINVAL  null pointer
+ * 32                 no pipe to the script
+ * ZAV_RC_ERR         an expander has no upstream link (logged; no unit is filled); the report
+ *                    could not be read (the units before are filled); .RBODinfo cannot be opened
+ *                    (all are filled)
+ *
+ * Blocks as long as the script takes and until the report is free.
+ */
+int zavGetRBODSet(sRBODSet *RBODSet);
+
+/**
+ * Serial number and model of the unit pRBOD->rbodid into `sn` and `model`, from the lines between
+ * the unit's marker and the first that begins with "I" in the controller's report, which is read
+ * through "cat". What is too long is cut. What the report does not say stays as it was; a missing
+ * report says nothing.
+ *
+ * ZAV_RC_OK          read
+ * ZAV_RC_ERR_EINVAL  null pointer
+ * ZAV_RC_ERR         the semaphore cannot be had (logged)
+ * 32                 no pipe
+ */
+int zavGetRBODSN(sRBODMap *pRBOD);
+
+/**
+ * Numbers the expanders of a table of seven by their places in the cascade: with id 0 from the one
+ * whose `id` is 1 downwards, otherwise from the one with the address `sasaddr` on, which becomes
+ * unit `id`. A link that is empty or "0000000000000000", an address that is not in the table and a
+ * number outside 1 to 7 end the numbering there. Always 0.
+ */
+int SetRBODID(sExpander *sep, char *sasaddr, int id);
+
+/**
+ * Fills the record of unit `id` from its expander and, serial number and model, from the
+ * controller's report (zavGetRBODSN). ZAV_RC_ERR if that fails, the rest is filled then;
+ * ZAV_RC_ERR_EINVAL for null pointers.
+ */
+int fillinfo(int id, sExpander *expander, sRBOD *rbod);
+
+/**
+ * The address in a line that /usr/bin/query_sas.sh prints: its fourth field between ":", "[" and
+ * "]", cut to 19 characters. A line with fewer fields leaves `sasaddr`, 20 bytes, as it was.
+ */
+void getsasaddr(char *line, char *sasaddr);
+
+/**
+ * State of the expansion unit rbod->id, 1 to 7, seen by the sensor `sensorid`. Everything but the
+ * number is found out anew (zavGetRBODSet) and told in info->rbod; a unit that is not there has
+ * iExist 0.
+ *
+ * ZAV_RBOD_EXPANDER  ZAV_RBOD_EXIST or ZAV_RBOD_NOTEXIST
+ * ZAV_RBOD_TEMP_CPU  `value` in degrees Celsius: below 75 ZAV_RBOD_NORMAL, from 75 on
+ *                    ZAV_RBOD_WARN, from 85 on ZAV_RBOD_ALARM
+ * ZAV_RBOD_VOLT_CPU  `value` in volts: between 1.08 and 1.32 ZAV_RBOD_NORMAL, up to 0.96 and from
+ *                    1.44 on ZAV_RBOD_ALARM, in between ZAV_RBOD_WARN. A report's 1.08 is NORMAL,
+ *                    its 1.32 is WARN, its 1.44 and 0.96 are ALARM: the reading has single precision.
+ * any other          ZAV_RBOD_NORMAL
+ *
+ * ZAV_RC_OK          as above. A value of 0 may also be a monitor line that is missing.
+ * ZAV_RC_ERR_EINVAL  null pointer, number of the unit; record untouched
+ * ZAV_RC_ERR_ENOMEM  no memory; record untouched
+ * others             as zavGetRBODSet and zavGetRBODHwMon return them; state ZAV_RBOD_NORMAL, which
+ *                    then means nothing
+ *
+ * Blocks as long as zavGetRBODSet does.
+ */
+int zavGetStateRBOD(sRBOD *rbod, int sensorid, zavRBODState *info);
 
 /* ==== Exchanging a disk =======================================================================
  *

@@ -1,4 +1,5 @@
-/* What the RAID controller's report says: a RAID set, its volumes and its disks. */
+/* What the RAID controller's report says: a RAID set, its volumes and its disks. Sizes, levels and
+   statuses are the report's own numbers. */
 #ifndef ZAV_HWRAID_H
 #define ZAV_HWRAID_H
 
@@ -15,7 +16,7 @@ typedef struct sPhyDiskInfo {
 typedef struct sVolSetInfo {
     int volnum;
     char volname[17];
-    int raidlevel; /* ZAV_RAIDLVL_* */
+    int raidlevel; /* the controller's own: 0 striped, 1 mirrored, 3 with parity */
     float volsize;
     int scsiId;
     int progress;
