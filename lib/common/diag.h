@@ -8,8 +8,9 @@ namespace zav {
 constexpr int kAlert = 1;   // LOG_ALERT
 constexpr int kWarning = 4; // LOG_WARNING
 
-// Trace types. They are compared with level 1, at which nearly all messages are issued: these stay
-// silent.
+// Trace types. They are compared with level 1, at which nearly all messages are issued: failures
+// reach standard output, the others stay silent.
+constexpr int kTraceFailure = 1;
 constexpr int kTraceCommand = 2;
 constexpr int kTraceStep = 3;
 constexpr int kTraceParser = 4;

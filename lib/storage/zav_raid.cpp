@@ -1,12 +1,12 @@
 // Level, state, members and rebuild progress of an array.
 #include "common/diag.h"
 #include "common/model.h"
-#include "common/node.h"
 #include "common/owner.h"
 #include "common/shell.h"
 #include "common/text.h"
 #include "zav_api.h"
 #include "zav_raid_parse.h"
+#include "zav_raid_query.h"
 
 #include <cstdio>
 #include <iterator>
@@ -16,35 +16,9 @@ namespace {
 constexpr int kLine = 80; // lines are read in pieces of at most 79 characters
 constexpr int kMaxArrays = 4;
 
-// The state that nothing has been found out for. The members' addresses are given a minor type
-// where they will be SATA disks.
-zavRaidState undecided(const zavDevice &dev, int member_minor_type) {
-    zavRaidState state = {};
-    state.type = ZAV_EVENT_RAID;
-    state.dev = dev;
-    state.raidlevel = ZAV_RAIDLVL_NONE;
-    for (zavDevice &member : state.hdddev)
-        member.minor_type = member_minor_type;
-    return state;
-}
-
 int refuse(const char *function, const char *message) {
     zavlogd(const_cast<char *>(function), zav::kAlert, ZAV_RC_ERR_EINVAL, "%s", message);
     return ZAV_RC_ERR_EINVAL;
-}
-
-// Looks for the array's node. When it is not there the query ends with what this stores in `rc`.
-bool node_present(const char *function, const char *kind, const char *path, int &state, int &rc) {
-    const zav::NodeProbe probe = zav::probe_node(function, path);
-    if (probe.result == zav::NodeProbe::Result::kPresent)
-        return true;
-    state = ZAV_RAID_NOT_EXIST;
-    rc = ZAV_RC_ERR;
-    if (probe.result == zav::NodeProbe::Result::kMissing) {
-        zav::log_missing_node(function, kind, path, probe.error);
-        rc = ZAV_RC_OK;
-    }
-    return false;
 }
 
 // Level and number of active members, from mdadm. The record ends up with the level and the
@@ -209,7 +183,7 @@ int getRaidStateSW(zavDevice *dev, zavRaidState *info) {
     if (!config.is_known())
         return refuse(__func__, "just be supported on model 2740H|2860. Return ZAV_RC_ERR_EINVAL.");
 
-    *info = undecided(*dev, ZAV_MINDEV_HDD_SATA);
+    *info = zav::undecided_raid(*dev, ZAV_MINDEV_HDD_SATA);
     if (dev->disk < 1 || dev->disk > kMaxArrays) // the message names the lower bound only
         return refuse(__func__, "Input device's disk argu. < 1! Return ZAV_RC_ERR_EINVAL.");
     if (dev->part != 1)
@@ -219,7 +193,7 @@ int getRaidStateSW(zavDevice *dev, zavRaidState *info) {
     zavDevToStr(path, sizeof path, dev);
     ZAV_TRACE(zav::kTraceStep, "%s() - device path from zavDevToStr is:  %s\n", __func__, path);
     int rc = ZAV_RC_OK;
-    if (!node_present(__func__, "md", path, info->state, rc))
+    if (!zav::raid_node_present(__func__, "md", path, info->state, rc))
         return rc;
 
     char mdname[16];
@@ -234,7 +208,7 @@ int getRaidStateISCSI(zavDevice *dev, zavRaidState *info) {
     ZAV_TRACE(zav::kTraceStep, "Enter %s().\n", __func__);
     if (dev->disk < 1 || dev->part != 0)
         return ZAV_RC_ERR_EINVAL;
-    *info = undecided(*dev, 0);
+    *info = zav::undecided_raid(*dev, 0);
 
     char path[50];
     if (const int rc = zavDevToStr(path, sizeof path, dev); rc != ZAV_RC_OK)
@@ -242,6 +216,6 @@ int getRaidStateISCSI(zavDevice *dev, zavRaidState *info) {
     ZAV_TRACE(zav::kTraceStep, "%s() - device path from zavDevToStr is:  %s\n", __func__, path);
     // A target that exists has no state bits set.
     int rc = ZAV_RC_OK;
-    node_present(__func__, "Device", path, info->state, rc);
+    zav::raid_node_present(__func__, "Device", path, info->state, rc);
     return rc;
 }

@@ -239,13 +239,4 @@ TEST_F(Disk, WithoutAKnownModelIsUndecided) {
     EXPECT_TRUE(record().log.empty());
 }
 
-TEST_F(Disk, BehindTheControllerIsRefusedAsItsReportIsNotRead) {
-    for (const int minor : {ZAV_MINDEV_HDD_HWSATA, ZAV_MINDEV_HDD_SAS}) {
-        const zavDevice dev = {ZAV_DEV_HDD, minor, 1, 0};
-        EXPECT_EQ(ask(dev), ZAV_RC_ERR_EINVAL);
-        expect_filled(dev, 0);
-    }
-    EXPECT_TRUE(record().log.empty());
-}
-
 } // namespace

@@ -418,15 +418,6 @@ TEST_F(Array, BehindTheControllerNeedsTheHardwareModel) {
                               "ZAV_RC_ERR_EINVAL.")});
 }
 
-TEST_F(Array, BehindTheControllerIsRefusedAsItsReportIsNotRead) {
-    EXPECT_EQ(ask({ZAV_DEV_RAID, ZAV_MINDEV_RAID_SAS, 1, 0}), ZAV_RC_ERR_EINVAL);
-    expect_untouched();
-    model("SV-2980\n", "t;0;4\n");
-    EXPECT_EQ(ask({ZAV_DEV_RAID, ZAV_MINDEV_RAID_HW, 1, 0}), ZAV_RC_ERR_EINVAL);
-    expect_untouched();
-    EXPECT_TRUE(record().log.empty());
-}
-
 class IscsiTarget : public Array {
   protected:
     static constexpr zavDevice kTarget = {ZAV_DEV_RAID, ZAV_MINDEV_RAID_ISCSI, 7, 0};
