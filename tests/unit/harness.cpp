@@ -81,10 +81,10 @@ Record &record() {
 }
 
 // What tests put into the root. The bare root itself comes with the directories.
-constexpr const char *kWipedDirectories[] = {"/etc/Kiru",      "/proc/zav",    "/proc/scsi",
-                                             "/sys/class",     "/dev/sata",    "/dev/swraid",
-                                             "/dev/iscsiraid", "/dev/DataVG1", "/dev/PrimaryOSVG",
-                                             "/sys/devices",   "/scratch"};
+constexpr const char *kWipedDirectories[] = {
+    "/etc/Kiru",        "/proc/zav",      "/proc/scsi",  "/sys/class",   "/dev/sata",
+    "/dev/swraid",      "/dev/iscsiraid", "/dev/hwraid", "/dev/sasraid", "/dev/DataVG1",
+    "/dev/PrimaryOSVG", "/sys/devices",   "/scratch"};
 constexpr const char *kWipedFiles[] = {"/proc/mdstat",
                                        "/dev/nvram",
                                        "/dev/mem",
@@ -92,7 +92,8 @@ constexpr const char *kWipedFiles[] = {"/proc/mdstat",
                                        "/bin/smartctl",
                                        "/etc/sysconfig/clock",
                                        "/etc/arecaTimeZone.list",
-                                       "/usr/bin/syncConf.sh"};
+                                       "/usr/bin/syncConf.sh",
+                                       "/usr/bin/query_sas.sh"};
 
 // The tests wipe directories of the system: never outside a private root.
 void require_private_root() {
@@ -105,6 +106,7 @@ void require_private_root() {
 
 Appliance::Appliance() {
     require_private_root();
+    record() = {};
     for (const char *path : kWipedDirectories) {
         fs::remove_all(path);
         fs::create_directories(path);
@@ -116,7 +118,7 @@ Appliance::Appliance() {
         if (id >= 0)
             semctl(id, 0, IPC_RMID);
     }
-    record() = {};
+    record() = {}; // that was no call of the library's
     record_is_ready = true;
 }
 
