@@ -1,5 +1,6 @@
 #include "launcher/options.hpp"
 
+#include "model/enclosures.hpp"
 #include "model/factory.hpp"
 #include "model/sentences.hpp"
 
@@ -49,6 +50,9 @@ void declare(CLI::App &app, Options &options) {
     app.add_option("--level", options.level,
                    "Level of the data array (default raid5 with four disks, raid1 with two)")
         ->check(CLI::IsMember(level_names()));
+    app.add_option("--units", options.units, "Expansion units of a 2980")
+        ->check(CLI::Range(0, most_units))
+        ->capture_default_str();
     app.add_option("--product", options.product, "Product name in the BIOS (default: the model's)");
     app.add_option("--serial", options.serial, "Serial number in the BIOS");
     app.add_option("--raidtype", options.raidtype, "Line of /etc/Kiru/raidtype");
@@ -125,6 +129,9 @@ Options parse_command_line(int argc, char **argv) {
         fail_usage("no command given: zavsim [OPTIONS] -- COMMAND [ARG...]");
     options.command.assign(dashes + 1, words.end());
     check_level(options);
+    if (app.count("--units") != 0 && !has_controller(options.model))
+        fail_usage(
+            fmt::format("model {} has no expansion units, --units does not apply", options.model));
     if (!options.scenario_file.empty())
         options.scenario = read_scenario(options.scenario_file);
     return options;

@@ -24,6 +24,7 @@ struct Options {
     std::string scenario;      // text of the scenario file, already checked
     std::string scenario_file; // its name, for messages
     double time_scale = 1.0;
+    int units = 2;
     bool bare = false;
     bool has_shim = false;
     std::string directory;         // where COMMAND starts
@@ -32,8 +33,8 @@ struct Options {
 };
 
 NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(Options, model, product, serial, raidtype, level, tools, hosts,
-                                   shell, scenario, scenario_file, time_scale, bare, has_shim,
-                                   directory, program_directory, command)
+                                   shell, scenario, scenario_file, time_scale, units, bare,
+                                   has_shim, directory, program_directory, command)
 
 // The options as one word of a command line, and back. Their texts are bytes, not characters.
 std::string to_word(const Options &options);

@@ -2,6 +2,7 @@
 
 #include "model/actions.hpp"
 #include "model/arrays.hpp"
+#include "model/enclosures.hpp"
 
 #include <algorithm>
 #include <limits>
@@ -60,7 +61,7 @@ double end_of_sync(const State &state, const Array &array) {
 }
 
 double next_turn(const State &state, double now) {
-    double turn = now;
+    double turn = std::min(now, next_rebuild_end(state));
     for (const Array &array : state.arrays)
         turn = std::min(turn, end_of_sync(state, array));
     if (!state.scenario.empty())
@@ -80,6 +81,7 @@ void finish_sync(const State &state, Array &array) {
 
 void copy_data(State &state, double until) {
     const double kib = (until - state.now) * state.rebuild_kib_per_second;
+    rebuild_volumes(state, until - state.now);
     state.now = until;
     for (Array &array : state.arrays) {
         if (!array.sync.running)

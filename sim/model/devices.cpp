@@ -2,6 +2,7 @@
 
 #include "model/arrays.hpp"
 #include "model/disks.hpp"
+#include "model/enclosures.hpp"
 #include "model/volumes.hpp"
 
 #include <fmt/format.h>
@@ -44,6 +45,24 @@ void add_volume(std::vector<Node> &nodes, const Group &group, const Volume &volu
     nodes.push_back({mapper_path(group, volume), "../" + kernel_name, 0, 0});
 }
 
+// Disks and volumes behind the RAID controller have nodes of their own in place of links.
+constexpr std::uint64_t enclosure_node_bytes = 512ULL << 20;
+
+void add_enclosure(std::vector<Node> &nodes, const Enclosure &enclosure) {
+    const bool unit = enclosure.number != 0;
+    const std::string disks =
+        unit ? fmt::format("/dev/sas/r{}disk", enclosure.number) : "/dev/hwsata/disk";
+    const std::string volumes =
+        unit ? fmt::format("/dev/sasraid/r{}disk", enclosure.number) : "/dev/hwraid/disk";
+    for (const Bay &bay : enclosure.bays)
+        if (bay.state != BayState::absent)
+            nodes.push_back(
+                {fmt::format("{}{}", disks, bay.number), {}, enclosure_node_bytes, bay.serial});
+    for (const RaidVolume &volume : enclosure.volumes)
+        nodes.push_back(
+            {fmt::format("{}{}", volumes, volume.number), {}, enclosure_node_bytes, volume.serial});
+}
+
 // Where a name of its own has a hyphen device-mapper writes two.
 std::string doubled_hyphens(const std::string &name) {
     std::string text;
@@ -65,6 +84,8 @@ std::vector<Node> device_nodes(const State &state) {
         for (const Volume &volume : group.volumes)
             if (volume.active)
                 add_volume(nodes, group, volume);
+    for (const Enclosure *enclosure : reached_enclosures(state))
+        add_enclosure(nodes, *enclosure);
     return nodes;
 }
 

@@ -2,6 +2,7 @@
 
 #include "model/arrays.hpp"
 #include "model/disks.hpp"
+#include "model/enclosures.hpp"
 #include "model/volumes.hpp"
 
 #include <array>
@@ -146,6 +147,10 @@ Identity identity_of(const std::string &model) {
     return identities.at(model);
 }
 
+bool has_controller(const std::string &model) {
+    return model == "2980";
+}
+
 std::string usual_level(const std::string &model) {
     const int disks = identity_of(model).disks;
     return disks >= 4 ? "raid5" : disks == 2 ? "raid1" : "linear";
@@ -184,6 +189,8 @@ State new_appliance(const Wishes &wishes) {
     state.data_level = level;
     state.rebuild_kib_per_second =
         static_cast<double>(component_of(2, level)) / data_rebuild_seconds;
+    if (has_controller(wishes.model))
+        state.controller = new_controller(state, wishes.units);
     if (disks < 2)
         return state;
     build_array(state, 1, "raid1");

@@ -19,6 +19,7 @@ struct Wishes {
     bool current_tools = false;
     double time_scale = 1;
     bool hosts_below_ata = false;
+    int units = 2; // expansion units of the model that has them
 };
 
 std::vector<std::string> model_names();
@@ -28,6 +29,8 @@ std::string usual_level(const std::string &model);
 
 // Why that model cannot have that level; empty when it can.
 std::string level_problem(const std::string &model, const std::string &level);
+
+bool has_controller(const std::string &model);
 
 // The line of /etc/Kiru/raidtype without its line feed.
 std::string raidtype_line(const std::string &model, const std::string &level);

@@ -46,12 +46,31 @@ NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(FileSystem, kib, reserved_kib, used_kib)
 NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(Volume, name, id, created, active, minor, segments, file_system,
                                    mount_point, busy)
 NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(Group, name, id, seqno, volumes)
+NLOHMANN_JSON_SERIALIZE_ENUM(BayState, {{BayState::found, "found"},
+                                        {BayState::absent, "absent"},
+                                        {BayState::failed, "failed"}})
+NLOHMANN_JSON_SERIALIZE_ENUM(RaidVolumeState, {{RaidVolumeState::normal, "normal"},
+                                               {RaidVolumeState::degraded, "degraded"},
+                                               {RaidVolumeState::rebuilding, "rebuilding"},
+                                               {RaidVolumeState::failed, "failed"}})
+NLOHMANN_JSON_SERIALIZE_ENUM(ReportFault, {{ReportFault::none, "none"},
+                                           {ReportFault::missing, "missing"},
+                                           {ReportFault::truncated, "truncated"},
+                                           {ReportFault::garbled, "garbled"}})
+NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(Bay, number, serial, state, gb)
+NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(RaidVolume, number, serial, name, level, gb, state, stale,
+                                   rebuilt_bay, rebuild_left)
+NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(Enclosure, number, present, linked, model, serial, address,
+                                   set_name, bays, volumes, readings)
+NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(Controller, enclosures, report_fault, slow_rewrites,
+                                   rewrite_seconds)
 NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(ToolFault, tool, hangs, prints, exits, missing)
 NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(Event, at, sentence)
 NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(State, model, data_level, current_tools, hosts_below_ata,
                                    time_scale, real_start, now, rebuild_kib_per_second, next_serial,
                                    next_sync_order, next_id, disks, arrays, stopped,
-                                   physical_volumes, groups, faults, scenario, scsi_hosts, notes)
+                                   physical_volumes, groups, controller, faults, scenario,
+                                   scsi_hosts, notes)
 
 std::string to_text(const State &state) {
     // A garbled tool text may hold any bytes.

@@ -251,10 +251,11 @@ std::string quoted(const std::string &word) {
 
 const std::vector<std::string> &known_tools() {
     static const std::vector<std::string> tools = {
-        "mdadm",     "smartctl",  "mknod",    "vgs",      "lvs",       "pvs",         "vgdisplay",
-        "lvdisplay", "pvdisplay", "vgcreate", "vgextend", "vgremove",  "vgcfgbackup", "vgchange",
-        "lvcreate",  "lvremove",  "lvchange", "pvcreate", "pvremove",  "udevinfo",    "sfdisk",
-        "dd",        "df",        "mount",    "umount",   "mkfs.ext4", "hbqSetup.sh"};
+        "mdadm",       "smartctl",  "mknod",       "vgs",         "lvs",      "pvs",
+        "vgdisplay",   "lvdisplay", "pvdisplay",   "vgcreate",    "vgextend", "vgremove",
+        "vgcfgbackup", "vgchange",  "lvcreate",    "lvremove",    "lvchange", "pvcreate",
+        "pvremove",    "udevinfo",  "sfdisk",      "dd",          "df",       "mount",
+        "umount",      "mkfs.ext4", "hbqSetup.sh", "query_sas.sh"};
     return tools;
 }
 

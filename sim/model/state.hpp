@@ -128,6 +128,55 @@ struct Group {
     std::vector<Volume> volumes;
 };
 
+// A place for a disk in an enclosure behind the RAID controller.
+enum class BayState { found, absent, failed };
+
+struct Bay {
+    int number = 0; // 1 to 4
+    int serial = 0; // of the disk, or of the last one that stood there
+    BayState state = BayState::found;
+    double gb = 0;
+};
+
+enum class RaidVolumeState { normal, degraded, rebuilding, failed };
+
+// A volume that the RAID controller makes of an enclosure's disks.
+struct RaidVolume {
+    int number = 0;
+    int serial = 0; // tells its node from every other
+    std::string name;
+    std::string level; // raid0, raid1, raid5, raid10
+    double gb = 0;
+    RaidVolumeState state = RaidVolumeState::normal;
+    std::vector<int> stale;  // bays whose part of the volume is lost, or not rebuilt yet
+    int rebuilt_bay = 0;     // whose part a rebuild restores; 0 when no bay's in particular
+    double rebuild_left = 0; // appliance seconds
+};
+
+// Disks with a hardware monitor: the controller's own, or those of an expansion unit.
+struct Enclosure {
+    int number = 0;      // 0 is the controller's own; 1 to 7, a unit's place in the cascade
+    bool present = true; // of itself, whatever it hangs on
+    bool linked = true;  // its expander knows the upstream one
+    std::string model;
+    std::string serial;
+    std::string address; // of a unit's expander
+    std::string set_name;
+    std::vector<Bay> bays;
+    std::vector<RaidVolume> volumes;
+    std::vector<double> readings; // of the hardware monitor
+};
+
+enum class ReportFault { none, missing, truncated, garbled };
+
+// The hardware-RAID model's controller and what hangs on it.
+struct Controller {
+    std::vector<Enclosure> enclosures; // by number, also those that are not present
+    ReportFault report_fault = ReportFault::none;
+    int slow_rewrites = 0;      // of the report, asked for so far
+    double rewrite_seconds = 0; // of the latest
+};
+
 struct ToolFault {
     std::string tool;
     double hangs = 0; // appliance seconds, each run
@@ -191,6 +240,7 @@ struct State {
     std::vector<Array> stopped; // known by what they left on their members
     std::vector<PhysicalVolume> physical_volumes; // a group's in the order in which it got them
     std::vector<Group> groups;                    // in the order in which they were made
+    std::optional<Controller> controller;
     std::vector<ToolFault> faults;
     std::vector<Event> scenario; // what is still to come, soonest first
     std::vector<int> scsi_hosts; // hosts with a device, in the order in which the kernel found them

@@ -5,6 +5,7 @@
 #include "model/texts.hpp"
 #include "model/texts_volumes.hpp"
 #include "root/files.hpp"
+#include "root/report.hpp"
 #include "tools/tools.hpp"
 
 #include <chrono>
@@ -47,6 +48,11 @@ void remove_stale_links(const Names &wanted) {
     write_text(links_file, nlohmann::json(wanted).dump());
 }
 
+// Nodes go by their path below /dev.
+std::string name_of(const Node &node) {
+    return node.path.substr(5);
+}
+
 fs::path bay_of(const std::string &name, int serial) {
     // Named by disk and partition, for the kernel name may be another one the next time.
     const std::size_t digits = name.find_first_of("0123456789");
@@ -78,10 +84,10 @@ void remove_stale_nodes(const Owners &wanted, const Owners &present) {
 }
 
 void make_node(const Node &node) {
-    const std::string name = fs::path(node.path).filename();
     std::error_code error;
+    fs::create_directories(fs::path(node.path).parent_path());
     if (node.serial != 0 && !fs::exists(node.path))
-        fs::rename(bay_of(name, node.serial), node.path, error);
+        fs::rename(bay_of(name_of(node), node.serial), node.path, error);
     if (!fs::exists(node.path))
         make_sparse(node.path, node.bytes);
 }
@@ -109,7 +115,7 @@ void publish_devices(const State &state) {
     Owners owners;
     for (const Node &node : nodes)
         if (node.target.empty())
-            owners[fs::path(node.path).filename()] = node.serial;
+            owners[name_of(node)] = node.serial;
         else
             links.insert(node.path);
     fs::create_directories(bays);
@@ -156,9 +162,14 @@ bool is_missing(const State &state, const std::string &tool) {
     return false;
 }
 
+// The expanders' script comes with the RAID controller.
+bool belongs_to_model(const State &state, const std::string &tool) {
+    return tool != "query_sas.sh" || state.controller;
+}
+
 void publish_tools(const State &state) {
     for (const Tool &tool : simulated_tools()) {
-        if (is_missing(state, tool.name))
+        if (is_missing(state, tool.name) || !belongs_to_model(state, tool.name))
             fs::remove(tool.path);
         else
             point_link(tool.path, place::program);
@@ -186,15 +197,17 @@ void publish_scsi(const std::string &list, const std::string &taken_command) {
 
 } // namespace
 
-void publish(const State &state, const std::string &taken_command) {
+bool publish(const State &state, const std::string &taken_command) {
     write_text("/proc/mdstat", mdstat_text(state));
     publish_devices(state);
     publish_labels(state);
     publish_ports(state);
     publish_mounts(state);
     publish_tools(state);
+    const bool shown = publish_report(state);
     // The last: who waits for a command to be done looks for the list in its place.
     publish_scsi(scsi_text(state), taken_command);
+    return shown;
 }
 
 } // namespace zavsim

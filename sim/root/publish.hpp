@@ -8,7 +8,7 @@
 namespace zavsim {
 
 // `taken_command` is what was found in /proc/scsi/scsi and acted on; another one that has come
-// since stays there for the next turn.
-void publish(const State &state, const std::string &taken_command);
+// since stays there for the next turn. False when something could not be shown yet.
+bool publish(const State &state, const std::string &taken_command);
 
 } // namespace zavsim

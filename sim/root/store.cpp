@@ -58,14 +58,14 @@ Turn::Turn() : lock_(open_locked()), state_(load()) {
     taken_command_ = take_scsi_command(state_);
 }
 
-void Turn::commit() {
+bool Turn::commit() {
     write_text(state_file, to_text(state_));
-    publish(state_, taken_command_);
+    return publish(state_, taken_command_);
 }
 
 void start_model(const Options &options) {
     State state = new_appliance({options.model, options.level, options.tools == "current",
-                                 options.time_scale, options.hosts == "ata"});
+                                 options.time_scale, options.hosts == "ata", options.units});
     state.real_start = machine_seconds();
     state.scenario = parse_scenario(options.scenario, options.scenario_file).events;
     write_text(state_file, to_text(state));

@@ -18,7 +18,8 @@ class Turn {
   public:
     Turn();
     State &state() { return state_; }
-    void commit();
+    // False when something could not be shown yet; a later turn will.
+    bool commit();
 
   private:
     Descriptor lock_;

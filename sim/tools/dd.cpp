@@ -15,6 +15,7 @@
 #include <fmt/format.h>
 #include <map>
 #include <optional>
+#include <set>
 #include <sys/stat.h>
 #include <unistd.h>
 
@@ -211,7 +212,11 @@ bool is_device(const std::string &path) {
     std::error_code error;
     const std::filesystem::path node = std::filesystem::canonical(path, error);
     const std::string name = node.filename();
-    return !error && node.parent_path() == "/dev" &&
+    static const std::set<std::string> behind_controller = {"/dev/hwsata", "/dev/hwraid",
+                                                            "/dev/sas", "/dev/sasraid"};
+    if (error || behind_controller.count(node.parent_path()) != 0)
+        return !error;
+    return node.parent_path() == "/dev" &&
            (parse_kernel_name(name) || array_behind(path) || name.rfind("dm-", 0) == 0);
 }
 
