@@ -9,6 +9,7 @@
 #include <dlfcn.h>
 #include <filesystem>
 #include <fstream>
+#include <mutex>
 #include <sstream>
 #include <sys/mman.h>
 #include <sys/sem.h>
@@ -33,7 +34,11 @@ Function *real(const char *name) {
     return reinterpret_cast<Function *>(dlsym(RTLD_NEXT, name));
 }
 
+// Several threads may be in the library. What a test sets before is read without it.
+std::mutex notes;
+
 void note_command(const char *command) {
+    const std::lock_guard turn(notes);
     record().commands.emplace_back(command);
     record().steps.emplace_back(command);
 }
@@ -227,7 +232,10 @@ FILE *popen(const char *command, const char *mode) {
 }
 
 int pclose(FILE *pipe) {
-    ++harness::record().pcloses;
+    {
+        const std::lock_guard turn(harness::notes);
+        ++harness::record().pcloses;
+    }
     return harness::real<int(FILE *)>("pclose")(pipe);
 }
 
@@ -265,7 +273,10 @@ int munmap(void *address, size_t size) noexcept {
 }
 
 int semget(key_t key, int semaphores, int flags) {
-    harness::record().semget_flags.push_back(flags);
+    {
+        const std::lock_guard turn(harness::notes);
+        harness::record().semget_flags.push_back(flags);
+    }
     if (harness::record().semget_fails) {
         errno = ENOSPC;
         return -1;
