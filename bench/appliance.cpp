@@ -71,7 +71,22 @@ std::string backup_text(int physical, int logical) {
     return text + "\t}\n}\n";
 }
 
+std::string report_text(int lines_before) {
+    std::string text =
+        "PCI\nM:HBRC-R16\nS:Y001\nI:\nR:1:Raid Set # 00:2000.0:4:1234:0\nH:38:1:2:3\n";
+    for (int i = 0; i < lines_before; ++i)
+        text += "D:1:500.1:1\n";
+    return text + "RBOD#1\nM:HBQE-T500\nS:Y101\nI:\nR:1:Raid Set # 01:4000.0:4:1234:0\n"
+                  "V:1:UNIT1:3:3000.0:0:1\nD:1:1000.2:1\nD:2:1000.2:1\nD:3:1000.2:1\n"
+                  "D:4:1000.2:1\nH:45.0:3200:11.9:5.1:1.20\n";
+}
+
 namespace {
+
+constexpr const char *topology_text = "  phy   0:D:attached:[5001B4D5008FF01F800:00]\n"
+                                      "  phy   4:S:attached:[500605B000C7F540:02  i(SSP+STP+SMP)]\n"
+                                      "  phy   8:S:attached:[0000000000000000:00]\n"
+                                      "  phy  10:S:attached:[0000000000000000:00]\n";
 
 void put(const fs::path &path, const std::string &text) {
     fs::create_directories(path.parent_path());
@@ -107,12 +122,14 @@ bool set_up_appliance() {
     put("/dev/sata/disk1", "");
     put("/dev/swraid/disk2p1", "");
     put("/etc/Kiru/zav/DataVG1", backup_text(1, 0));
+    put("/etc/Kiru/zav/.raidinfo", report_text(0));
     put_tool("/usr/sbin/vgs", "  DataVG1   1   0   0 wz--n- 952.00m 760.00m\n");
     // Of use to both of its readers: the twelfth field and the two counts.
     put_tool("/usr/sbin/vgdisplay", "  DataVG1:r/w:772:-1:0:0:0:-1:0:1:1:974848:4096\n"
                                     "  Cur LV                0\n  Cur PV                1\n");
     put_tool("/usr/sbin/vgcfgbackup", "");
     put_tool("/usr/sbin/udevinfo", "swraid/disk2p1\n");
+    put_tool("/usr/bin/query_sas.sh", topology_text);
     put_tool("/usr/bin/smartctl", "");
     put_tool("/usr/bin/syncConf.sh", "");
     put_tool("/usr/sbin/mdadm", detail_text);

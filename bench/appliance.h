@@ -12,6 +12,9 @@ extern const std::string mdstat_text;
 // A metadata backup of a group with that many physical and logical volumes.
 std::string backup_text(int physical, int logical);
 
+// A RAID controller's report, its unit's section behind that many lines.
+std::string report_text(int lines_before);
+
 // Lays down files, device names and tools. False, with a word to the user, outside a private root:
 // the files belong to the system there.
 bool set_up_appliance();

@@ -46,6 +46,12 @@ void read_group(const char * /*they are these*/) {
     read_all("echo /dev/`udevinfo -q symlink -p /block/md1`");
 }
 
+// The commands of the expansion units' query, of which there is one.
+void find_units(const char * /*they are these*/) {
+    read_all("/usr/bin/query_sas.sh");
+    read_all("cat /etc/Kiru/zav/.raidinfo");
+}
+
 // ---- The library's calls. ----
 
 void ask_disk() {
@@ -71,6 +77,13 @@ void ask_group() {
             "zavgetStateLVMVG");
 }
 
+void ask_units() {
+    sRBODSet units;
+    require(zavGetRBODSet(&units) == ZAV_RC_OK && units.RBOD[0].iExist == 1 &&
+                units.RBOD[1].iExist == 0 && *units.RBOD[0].sn != '\0',
+            "zavGetRBODSet");
+}
+
 void count_disks() {
     int count = 0;
     require(get_diskcount(&count) == ZAV_RC_OK && count == 1, "get_diskcount");
@@ -92,6 +105,7 @@ const std::vector<Query> &queries() {
          ask_disk},
         {"zavGetStateRaid, software array", "/sbin/mdadm --detail /dev/md1", read_all, ask_array},
         {"zavgetStateLVMVG, one PV", "", read_group, ask_group},
+        {"zavGetRBODSet, one unit", "", find_units, ask_units},
         {"get_diskcount", "cat /proc/scsi/scsi | grep \"Vendor: ATA\" | wc -l", read_all,
          count_disks},
         {"zavMapArcTimeZone",

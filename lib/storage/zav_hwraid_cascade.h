@@ -5,6 +5,9 @@
 
 namespace zav {
 
+// Does the address stand for a link that leads nowhere?
+bool is_no_link(const char *address);
+
 struct Cascade {
     static constexpr int kExpanders = 7;
 

@@ -4,6 +4,7 @@
 #include "common/raid_report.h"
 #include "common/report_turn.h"
 #include "common/shell.h"
+#include "common/text.h"
 #include "zav_api.h"
 #include "zav_hwraid_cascade.h"
 
@@ -31,6 +32,20 @@ int read_cascade(const char *function, zav::Cascade &cascade) {
         }
     }
     return ZAV_RC_OK;
+}
+
+sExpander *expander_at(sExpander *expanders, const char *address) {
+    for (int i = 0; i < zav::Cascade::kExpanders; ++i)
+        if (strncmp(expanders[i].sasaddr, address, sizeof expanders[i].sasaddr) == 0)
+            return &expanders[i];
+    return nullptr;
+}
+
+sExpander *first_unit(sExpander *expanders) {
+    for (int i = 0; i < zav::Cascade::kExpanders; ++i)
+        if (expanders[i].id == zav::kFirstUnit)
+            return &expanders[i];
+    return nullptr;
 }
 
 int fill_units(zav::Cascade &cascade, sRBODSet &set) {
@@ -104,6 +119,59 @@ int zavGetRBODSet(sRBODSet *RBODSet) {
     if (const int rc = fill_units(cascade, *RBODSet); rc != ZAV_RC_OK)
         return rc;
     return publish_units(*RBODSet);
+}
+
+void getsasaddr(char *line, char *sasaddr) {
+    if (line == nullptr || sasaddr == nullptr)
+        return;
+    constexpr const char *kSeparators = ":[]";
+    const char *field = line + strspn(line, kSeparators);
+    for (int skipped = 0; skipped < 3; ++skipped) {
+        field += strcspn(field, kSeparators);
+        field += strspn(field, kSeparators);
+    }
+    const size_t length = strcspn(field, kSeparators);
+    if (length != 0)
+        snprintf(sasaddr, sizeof(sExpander::sasaddr), "%.*s", static_cast<int>(length), field);
+}
+
+int SetRBODID(sExpander *sep, char *sasaddr, int id) {
+    if (sep == nullptr)
+        return ZAV_RC_OK;
+    sExpander *expander = nullptr;
+    if (id == 0) {
+        expander = first_unit(sep);
+        id = zav::kFirstUnit;
+    } else if (sasaddr != nullptr && *sasaddr != '\0' && !zav::is_no_link(sasaddr) &&
+               id >= zav::kFirstUnit && id <= zav::kLastUnit) { // a loop of links ends here
+        expander = expander_at(sep, sasaddr);
+    }
+    if (expander == nullptr)
+        return ZAV_RC_OK;
+    expander->iExist = 1;
+    expander->id = id;
+    SetRBODID(sep, expander->upperchild, 2 * id);
+    return SetRBODID(sep, expander->lowerchild, 2 * id + 1);
+}
+
+int fillinfo(int id, sExpander *expander, sRBOD *rbod) {
+    if (expander == nullptr || rbod == nullptr)
+        return ZAV_RC_ERR_EINVAL;
+    rbod->iExist = 1;
+    rbod->id = id;
+    memcpy(rbod->sasaddr, expander->sasaddr, sizeof rbod->sasaddr);
+    rbod->parentid = id / 2;
+    // By the place in the cascade, whatever was found there.
+    rbod->upperchildid = zav::is_no_link(expander->upperchild) ? -1 : 2 * id;
+    rbod->lowerchildid = zav::is_no_link(expander->lowerchild) ? -1 : 2 * id + 1;
+
+    sRBODMap identity = {};
+    identity.rbodid = id;
+    if (zavGetRBODSN(&identity) != ZAV_RC_OK)
+        return ZAV_RC_ERR;
+    zav::copy_text(rbod->sn, sizeof rbod->sn, identity.sn);
+    zav::copy_text(rbod->model, sizeof rbod->model, identity.model);
+    return ZAV_RC_OK;
 }
 
 int zavGetRBODSN(sRBODMap *pRBOD) {
