@@ -29,6 +29,13 @@ constexpr const char *footer =
     "  disk N fails | vanishes | appears | joins | detaches | attaches\n"
     "  array N checks | repairs | stops\n"
     "  volume G-N fills 95% | is active | is inactive | is busy | is idle\n"
+    "  controller volume N degrades | fails | rebuilds | recovers\n"
+    "  controller temperature 61.5\n"
+    "  unit U vanishes | appears | loses its link | finds its link\n"
+    "  unit U disk N fails | vanishes | appears\n"
+    "  unit U volume degrades | fails | rebuilds | recovers\n"
+    "  unit U temperature 88 | voltage 1.1\n"
+    "  report is missing | is truncated | is garbled | rewrites 5s | works again\n"
     "  tool NAME hangs 30s | prints \"TEXT\" | exits N | is missing | works again";
 
 class HelpPage : public CLI::Formatter {

@@ -2,6 +2,7 @@
 
 #include "model/arrays.hpp"
 #include "model/contents.hpp"
+#include "model/controller_actions.hpp"
 #include "model/disks.hpp"
 #include "model/sentences.hpp"
 #include "model/volumes.hpp"
@@ -227,10 +228,17 @@ bool is_about_array(Action::Kind kind) {
 bool is_about_volume(Action::Kind kind) {
     return kind > Action::Kind::array_stops && kind <= Action::Kind::volume_is_idle;
 }
+// Where there is a RAID controller, the disks are its own.
+bool is_about_controller(const State &state, const Action &action) {
+    return action.kind > Action::Kind::tool_works || action.unit != 0 ||
+           (is_about_disk(action.kind) && state.controller);
+}
 
 } // namespace
 
 std::string perform(State &state, const Action &action) {
+    if (is_about_controller(state, action))
+        return act_on_controller(state, action);
     if (is_about_disk(action.kind))
         return act_on_disk(state, action);
     if (is_about_array(action.kind))

@@ -1,5 +1,7 @@
 #include "model/sentences.hpp"
 
+#include "model/sentence_parts.hpp"
+
 #include <algorithm>
 #include <array>
 #include <fmt/format.h>
@@ -10,120 +12,19 @@ namespace zavsim {
 
 namespace {
 
-struct Word {
-    std::string text;
-    bool quoted = false;
-};
-
-struct Words {
-    std::vector<Word> list;
-    std::string error;
-};
-
-char unescaped(char c) {
-    return c == 'n' ? '\n' : c == 't' ? '\t' : c;
-}
-
-// Reads a quoted word from behind its opening quote; answers where it ended, or nothing.
-std::optional<std::size_t> read_quoted(const std::string &text, std::size_t at, Word &word) {
-    word.quoted = true;
-    for (; at < text.size() && text[at] != '"'; ++at)
-        if (text[at] == '\\' && at + 1 < text.size())
-            word.text += unescaped(text[++at]);
-        else
-            word.text += text[at];
-    if (at == text.size())
-        return std::nullopt;
-    return at + 1;
-}
-
-// Splits at blanks; "..." is one word; # starts a comment.
-Words split(const std::string &text) {
-    Words words;
-    for (std::size_t at = 0; at < text.size();) {
-        if (isspace(static_cast<unsigned char>(text[at])) != 0) {
-            ++at;
-            continue;
-        }
-        if (text[at] == '#')
-            break;
-        Word word;
-        if (text[at] == '"') {
-            const auto end = read_quoted(text, at + 1, word);
-            if (!end)
-                return {{}, "a quoted text has no end"};
-            at = *end;
-        } else {
-            const std::size_t end = std::min(text.find_first_of(" \t\r", at), text.size());
-            word.text = text.substr(at, end - at);
-            at = end;
-        }
-        words.list.push_back(word);
-    }
-    return words;
-}
-
-std::optional<int> whole_number(const std::string &text, int least, int most) {
-    if (text.empty() || text.size() > 4 ||
-        text.find_first_not_of("0123456789") != std::string::npos)
-        return std::nullopt;
-    const int number = std::stoi(text);
-    return number < least || number > most ? std::nullopt : std::optional(number);
-}
-
-// 10s, 2m, 500ms, 1.5s
-std::optional<double> duration(const std::string &text) {
-    const std::size_t end = std::min(text.find_first_not_of("0123456789."), text.size());
-    const std::string digits = text.substr(0, end);
-    const std::string unit = text.substr(end);
-    const double factor = unit == "s" ? 1 : unit == "m" ? 60 : unit == "ms" ? 0.001 : 0;
-    if (factor == 0 || digits.empty() || digits.size() > 9 || digits.front() == '.' ||
-        std::count(digits.begin(), digits.end(), '.') > 1)
-        return std::nullopt;
-    return std::stod(digits) * factor;
-}
-
-Sentence wrong(const std::string &error) {
-    return {{}, error};
-}
-
-struct Verb {
-    const char *word;
-    Action::Kind kind;
-};
-
-template <std::size_t Count>
-Sentence about_numbered(const std::vector<Word> &words, const std::array<Verb, Count> &verbs,
-                        const std::string &allowed) {
-    const std::string &noun = words[0].text;
-    const auto number = words.size() < 2 ? std::nullopt : whole_number(words[1].text, 1, 4);
-    if (!number)
-        return wrong(fmt::format("{} wants a number from 1 to 4", noun));
-    for (const Verb &verb : verbs)
-        if (words.size() == 3 && words[2].text == verb.word) {
-            Action action;
-            action.kind = verb.kind;
-            action.number = *number;
-            return {action, {}};
-        }
-    return wrong(fmt::format("{} {} {}", noun, *number, allowed));
-}
-
 Sentence about_disk(const std::vector<Word> &words) {
-    static constexpr std::array<Verb, 6> verbs = {{{"fails", Action::Kind::disk_fails},
-                                                   {"vanishes", Action::Kind::disk_vanishes},
-                                                   {"appears", Action::Kind::disk_appears},
-                                                   {"joins", Action::Kind::disk_joins},
-                                                   {"detaches", Action::Kind::disk_detaches},
-                                                   {"attaches", Action::Kind::disk_attaches}}};
-    return about_numbered(words, verbs, "fails, vanishes, appears, joins, detaches or attaches");
+    static const std::vector<Verb> verbs = {
+        {"fails", Action::Kind::disk_fails},       {"vanishes", Action::Kind::disk_vanishes},
+        {"appears", Action::Kind::disk_appears},   {"joins", Action::Kind::disk_joins},
+        {"detaches", Action::Kind::disk_detaches}, {"attaches", Action::Kind::disk_attaches}};
+    return numbered_noun(words, 4, verbs, "fails, vanishes, appears, joins, detaches or attaches");
 }
 
 Sentence about_array(const std::vector<Word> &words) {
-    static constexpr std::array<Verb, 3> verbs = {{{"checks", Action::Kind::array_checks},
-                                                   {"repairs", Action::Kind::array_repairs},
-                                                   {"stops", Action::Kind::array_stops}}};
-    return about_numbered(words, verbs, "checks, repairs or stops");
+    static const std::vector<Verb> verbs = {{"checks", Action::Kind::array_checks},
+                                            {"repairs", Action::Kind::array_repairs},
+                                            {"stops", Action::Kind::array_stops}};
+    return numbered_noun(words, 4, verbs, "checks, repairs or stops");
 }
 
 // "1-2": the second volume of the first data group; group 0 is the system's.
@@ -216,7 +117,13 @@ Sentence from_words(const std::vector<Word> &words) {
         return about_volume(words);
     if (noun == "tool")
         return about_tool(words);
-    return wrong("a sentence begins with disk, array, volume or tool");
+    if (noun == "controller")
+        return about_controller(words);
+    if (noun == "unit")
+        return about_unit(words);
+    if (noun == "report")
+        return about_report(words);
+    return wrong("a sentence begins with disk, array, volume, controller, unit, report or tool");
 }
 
 // One line of a scenario: nothing, or "at TIME SENTENCE".

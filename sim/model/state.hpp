@@ -206,11 +206,28 @@ struct Action {
         tool_prints,
         tool_exits,
         tool_is_missing,
-        tool_works
+        tool_works,
+        raid_volume_degrades,
+        raid_volume_fails,
+        raid_volume_rebuilds,
+        raid_volume_recovers,
+        unit_vanishes,
+        unit_appears,
+        unit_loses_link,
+        unit_finds_link,
+        temperature_changes,
+        voltage_changes,
+        report_is_missing,
+        report_is_truncated,
+        report_is_garbled,
+        report_rewrites,
+        report_works
     };
     Kind kind = Kind::disk_fails;
-    int number = 0; // disk, array or volume, counted from 1
-    int group = 0;  // of the volume; 0 is the system's
+    int number = 0;   // disk, array or volume, counted from 1
+    int unit = 0;     // expansion unit; 0 for the controller
+    double value = 0; // of a reading
+    int group = 0;    // of the volume; 0 is the system's
     int percent = 0;
     std::string tool;
     double seconds = 0;

@@ -1,6 +1,7 @@
 #include "root/background.hpp"
 
 #include "root/files.hpp"
+#include "root/report.hpp"
 #include "root/store.hpp"
 
 #include <array>
@@ -53,21 +54,34 @@ void write_notes(State &state) {
     state.notes.clear();
 }
 
-void tick() {
+State play_turn() {
     Turn turn;
     write_notes(turn.state());
     turn.commit();
+    return turn.state();
+}
+
+// Several rewrites that were asked for between two ticks are one. It is started when the turn is
+// over, for it would keep the turn's lock.
+void tick(int &rewrites_started) {
+    const State state = play_turn();
+    if (!state.controller || state.controller->slow_rewrites == rewrites_started)
+        return;
+    rewrites_started = state.controller->slow_rewrites;
+    start_slow_rewrite(state);
 }
 
 [[noreturn]] void run_background(int log_socket) {
     prctl(PR_SET_PDEATHSIG, SIGKILL);
     prctl(PR_SET_NAME, "zavsim-model");
+    signal(SIGCHLD, SIG_IGN); // nobody waits for the processes that rewrite the report
+    int rewrites_started = 0;
     for (;;) {
         pollfd log{log_socket, POLLIN, 0};
         poll(&log, 1, tick_milliseconds);
         drain_log(log_socket);
         try {
-            tick();
+            tick(rewrites_started);
         } catch (const std::exception &error) {
             append_log(fmt::format("<3>zavsim: {}", error.what()));
         }

@@ -9,4 +9,10 @@ namespace zavsim {
 // it stands as it was.
 bool publish_report(const State &state);
 
+// Has a process of its own rewrite the report slowly: half of it, a while later the rest.
+void start_slow_rewrite(const State &state);
+
+// Whether the first half is written of the rewrite of that number, or of a later one.
+bool slow_rewrite_has_begun(int number);
+
 } // namespace zavsim

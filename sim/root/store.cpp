@@ -6,10 +6,10 @@
 #include "model/factory.hpp"
 #include "model/json.hpp"
 #include "model/sentences.hpp"
+#include "root/clock.hpp"
 #include "root/publish.hpp"
 
 #include <cerrno>
-#include <ctime>
 #include <fcntl.h>
 #include <stdexcept>
 #include <sys/file.h>
@@ -21,12 +21,6 @@ namespace {
 
 const std::string state_file = place::run + "/state.json";
 const std::string lock_file = place::run + "/lock";
-
-double machine_seconds() {
-    timespec now{};
-    clock_gettime(CLOCK_MONOTONIC, &now);
-    return static_cast<double>(now.tv_sec) + static_cast<double>(now.tv_nsec) * 1e-9;
-}
 
 int open_locked() {
     const int fd = open(lock_file.c_str(), O_RDWR | O_CREAT | O_CLOEXEC, 0660);

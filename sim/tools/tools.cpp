@@ -1,15 +1,13 @@
 #include "tools/tools.hpp"
 
 #include "model/json.hpp"
+#include "root/clock.hpp"
 #include "root/store.hpp"
 #include "tools/command.hpp"
 
 #include <algorithm>
 #include <fmt/format.h>
 #include <set>
-#include <sys/syscall.h>
-#include <time.h>
-#include <unistd.h>
 
 namespace zavsim {
 
@@ -35,15 +33,6 @@ bool is_volume_tool(const std::string &name) {
     const bool noun = starts_with(name, "vg") || starts_with(name, "lv") || starts_with(name, "pv");
     return noun && (verbs.count(name.substr(2)) != 0 || starts_with(name, "vgcfg") ||
                     starts_with(name, "vgimport"));
-}
-
-// Not scaled by the preloaded shim, which may be there or not: the fault's own seconds count.
-void sleep_unscaled(double seconds) {
-    timespec left{};
-    left.tv_sec = static_cast<time_t>(seconds);
-    left.tv_nsec = static_cast<long>((seconds - static_cast<double>(left.tv_sec)) * 1e9);
-    while (syscall(SYS_clock_nanosleep, CLOCK_MONOTONIC, 0, &left, &left) == EINTR) {
-    }
 }
 
 struct Present {

@@ -1,0 +1,49 @@
+// What sentences are made of: words, numbers, verbs.
+#pragma once
+
+#include "model/sentences.hpp"
+
+#include <optional>
+#include <string>
+#include <vector>
+
+namespace zavsim {
+
+struct Word {
+    std::string text;
+    bool quoted = false;
+};
+
+struct Words {
+    std::vector<Word> list;
+    std::string error;
+};
+
+// Splits at blanks; "..." is one word; # starts a comment.
+Words split(const std::string &text);
+
+std::optional<int> whole_number(const std::string &text, int least, int most);
+
+// 12, 12.5, with so many places behind the point at most.
+std::optional<double> decimal_number(const std::string &text, std::size_t places);
+
+// 10s, 2m, 500ms, 1.5s
+std::optional<double> duration(const std::string &text);
+
+Sentence wrong(const std::string &error);
+
+struct Verb {
+    const char *word;
+    Action::Kind kind;
+};
+
+// "NOUN N VERB", with N from 1.
+Sentence numbered_noun(const std::vector<Word> &words, int most, const std::vector<Verb> &verbs,
+                       const std::string &allowed);
+
+// Sentences about the hardware-RAID model.
+Sentence about_controller(const std::vector<Word> &words);
+Sentence about_unit(const std::vector<Word> &words);
+Sentence about_report(const std::vector<Word> &words);
+
+} // namespace zavsim
