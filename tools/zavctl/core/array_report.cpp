@@ -1,5 +1,9 @@
 #include "array_report.h"
 
+#include "raid_set.h"
+#include "slot_id.h"
+#include "verdict.h"
+
 #include "zav_event.h"
 
 #include <fmt/format.h>
@@ -15,8 +19,19 @@ constexpr const char *level_words[] = {"unknown", "none",   "raid0",  "raid1",  
 
 std::string array_name(const ArrayReport &array) {
     if (array.kernel_name.empty())
-        return fmt::format("{}", array.number);
-    return fmt::format("{} ({})", array.number, array.kernel_name);
+        return array_id(array);
+    return fmt::format("{} ({})", array_id(array), array.kernel_name);
+}
+
+// "2 md1", "2-1 UNIT2VOL".
+std::string array_title(const ArrayReport &array) {
+    const std::string &name = array.kernel_name.empty() ? array.volume_name : array.kernel_name;
+    return trimmed(fmt::format("{} {}", array_id(array), printable(name)));
+}
+
+bool is_same_disk(const DiskReport &disk, const Member &member) {
+    const SlotId id = slot_id(member.address.device);
+    return disk.unit == id.unit && disk.slot == id.number;
 }
 
 Finding finding(const ArrayReport &array) {
@@ -48,7 +63,7 @@ std::string short_name(const Address &address) {
 std::string member_text(const Member &member, const std::vector<DiskReport> &disks) {
     std::string name = short_name(member.address);
     for (const DiskReport &disk : disks)
-        if (disk.slot == member.address.device.disk && disk.state != ZAV_HDD_FOUND)
+        if (is_same_disk(disk, member) && disk.state != ZAV_HDD_FOUND)
             return fmt::format("{}({})", name, disk_state_word(disk));
     if (member.state == "active" || member.state == "unknown")
         return name;
@@ -78,24 +93,27 @@ std::string shown_level(int level) {
 }
 
 Section common_section(const std::vector<ArrayReport> &arrays) {
-    Section section;
-    section.key = "arrays";
-    section.records = Json::array();
-    for (const ArrayReport &array : arrays) {
-        section.records.push_back(array_json(array));
-        if (severity(array) != Severity::ok)
-            section.findings.push_back(finding(array));
-    }
+    Section section = section_of("arrays", arrays, array_json, finding);
     const auto normal = std::count_if(arrays.begin(), arrays.end(), [](const ArrayReport &array) {
         return severity(array) == Severity::ok && array.state != ZAV_RAID_NOT_EXIST;
     });
-    section.well = fmt::format("{} {} normal", normal, normal == 1 ? "array" : "arrays");
+    section.well = counted(static_cast<std::size_t>(normal), "array", "normal");
     return section;
+}
+
+void add_reported(Details &details, const ArrayReport &array) {
+    if (!array.volume_name.empty())
+        details.add("Name", printable(array.volume_name));
+    details.add("In", array.unit == 0 ? "the RAID controller's enclosure"
+                                      : fmt::format("expansion unit {}", array.unit));
+    if (!array.raid_set.empty())
+        details.add("RAID set", printable(array.raid_set));
+    details.add("Size", reported_size(array.size));
 }
 
 Details array_details(const ArrayReport &array) {
     Details details;
-    details.add("Array", fmt::format("{}", array.number));
+    details.add("Array", array_id(array));
     details.add("State", shown_state(array), severity(array));
     if (rebuild_percent(array))
         details.add("Rebuilt", rebuild_text(array));
@@ -103,12 +121,41 @@ Details array_details(const ArrayReport &array) {
     details.add("Device",
                 array.address.path + (array.kernel_name.empty() ? "" : ", " + array.kernel_name));
     details.add("Members", members_text(array, {}));
-    if (!array_note(array).empty())
-        details.add("Note", array_note(array));
-    if (!array.doubt.empty())
-        details.add("Doubt", array.doubt, Severity::unknown);
+    if (is_reported(array))
+        add_reported(details, array);
+    add_verdict(details, array_note(array), array.doubt);
     details.add_lines("Kernel", array.kernel_says);
     return details;
+}
+
+// As the RAID controller knows the disk: the kernel does not.
+void add_state(Member &member, const sRaidSetInfo &set) {
+    const int slot = slot_id(member.address.device).number;
+    if (slot < 1 || slot > enclosure_slots)
+        return;
+    const std::string word = disk_status_word(set.sDiskInfo[slot - 1].status);
+    member.state = word == "found" ? "active" : word == "failed" ? "faulty" : "unknown";
+    if (!is_member(set, slot))
+        member.state = "out";
+}
+
+std::string no_known_state(const ArrayReport &array) {
+    return fmt::format("the library says {}, which is no known state", array.state);
+}
+
+std::string note_of_reported(const ArrayReport &array) {
+    if (!array.doubt.empty())
+        return array.doubt;
+    if (array.state == 0 && !array.in_report)
+        return "the RAID controller's report has no such volume, though its device is there";
+    if (array_state_word(array) == "unknown")
+        return no_known_state(array);
+    if (array.state != ZAV_RAID_NOT_EXIST)
+        return "";
+    if (array.node_present)
+        return "the RAID controller reports it as not existing";
+    return array.in_report ? "the RAID controller's report has it, but its device is missing"
+                           : "the RAID controller's report has no such volume";
 }
 
 } // namespace
@@ -118,46 +165,49 @@ std::string level_word(int level) {
     return named ? level_words[level] : "unknown";
 }
 
-std::string array_state_word(const ArrayReport &array) {
-    if (array.failure)
-        return "unknown";
-    switch (array.state) {
-    case 0: // an iSCSI target that exists has no state bits
-        return "present";
-    case ZAV_RAID_NORMAL:
-        return "normal";
-    case ZAV_RAID_DEGRADED:
-        return "degraded";
-    case ZAV_RAID_RESYNC:
-        return "resync";
-    case ZAV_RAID_FAILED:
-        return "failed";
-    case ZAV_RAID_NOT_EXIST:
-        return "not_exist";
-    default:
-        return "unknown";
+std::string array_id(const ArrayReport &array) {
+    return in_words(SlotId{array.unit, array.number});
+}
+
+bool is_reported(const ArrayReport &array) {
+    const int minor = array.address.device.minor_type;
+    return minor == ZAV_MINDEV_RAID_HW || minor == ZAV_MINDEV_RAID_SAS;
+}
+
+void tell_enclosure(ArrayReport &array, int result, const sRaidSetInfo &set) {
+    if (result == ZAV_RC_ERR_ENODEV)
+        array.doubt = doubt_without_set(array.unit);
+    if (result != ZAV_RC_OK)
+        return;
+    array.raid_set = set_name(set);
+    for (Member &member : array.members)
+        add_state(member, set);
+    if (const sVolSetInfo *volume = volume_of(set, array.number)) {
+        array.volume_name = volume_name(*volume);
+        array.size = as_written(volume->volsize).value_or(0);
+        array.in_report = array.expected = true;
     }
 }
 
-Severity severity(const ArrayReport &array) {
+std::string array_state_word(const ArrayReport &array) {
     if (array.failure)
+        return "unknown";
+    if (array.state == 0 && !is_reported(array))
+        return "present"; // an iSCSI target that exists has no state bits
+    return volume_status_word(array.state);
+}
+
+Severity severity(const ArrayReport &array) {
+    const std::string word = array_state_word(array);
+    if (word == "unknown")
         return Severity::unknown;
-    if (!array.doubt.empty() && array.state != ZAV_RAID_NOT_EXIST)
+    if (!array.doubt.empty() && (word != "not_exist" || is_reported(array)))
         return Severity::unknown;
-    switch (array.state) {
-    case 0:
-    case ZAV_RAID_NORMAL:
-        return Severity::ok;
-    case ZAV_RAID_DEGRADED:
-    case ZAV_RAID_RESYNC:
+    if (word == "degraded" || word == "resync")
         return Severity::warning;
-    case ZAV_RAID_FAILED:
+    if (word == "failed")
         return Severity::critical;
-    case ZAV_RAID_NOT_EXIST:
-        return array.expected ? Severity::critical : Severity::ok;
-    default:
-        return Severity::unknown;
-    }
+    return word == "not_exist" && array.expected ? Severity::critical : Severity::ok;
 }
 
 std::string shown_state(const ArrayReport &array) {
@@ -173,6 +223,10 @@ std::string array_note(const ArrayReport &array) {
         return in_words(*array.failure) + ": " + array.refusal;
     if (array.failure)
         return in_words(*array.failure);
+    if (is_reported(array))
+        return note_of_reported(array);
+    if (array_state_word(array) == "unknown")
+        return no_known_state(array);
     if (severity(array) == Severity::unknown)
         return fmt::format("the library says {}, which cannot be trusted", array_state_word(array));
     if (array.state == ZAV_RAID_NOT_EXIST && array.expected)
@@ -204,23 +258,29 @@ Json array_json(const ArrayReport &array) {
     for (const Member &member : array.members)
         json["members"].push_back({{"address", to_json(member.address)}, {"state", member.state}});
     json["expected"] = array.expected;
-    json["severity"] = word(severity(array));
-    json["note"] = array_note(array);
-    json["doubt"] = array.doubt.empty() ? Json(nullptr) : Json(array.doubt);
-    json["error"] = to_json(array.failure);
+    json["id"] = array_id(array);
+    json["unit"] = array.unit == 0 ? Json(nullptr) : Json(array.unit);
+    json["volume_name"] = array.volume_name.empty() ? Json(nullptr) : Json(array.volume_name);
+    json["size"] = array.size == 0 ? Json(nullptr) : Json(array.size);
+    json["raid_set"] = array.raid_set.empty() ? Json(nullptr) : Json(array.raid_set);
+    add_verdict(json, severity(array), array_note(array), array.doubt, array.failure);
     return json;
 }
 
 Section array_list_section(const std::vector<ArrayReport> &arrays,
                            const std::vector<DiskReport> &disks) {
     Section section = common_section(arrays);
-    section.table = Table({"ARRAY", "LEVEL", "STATE", "MEMBERS"}, 2);
+    const bool sized = std::any_of(arrays.begin(), arrays.end(),
+                                   [](const ArrayReport &array) { return is_reported(array); });
+    section.table = sized ? Table({"ARRAY", "LEVEL", "STATE", "SIZE", "MEMBERS"}, 2)
+                          : Table({"ARRAY", "LEVEL", "STATE", "MEMBERS"}, 2);
     for (const ArrayReport &array : arrays) {
         const std::string note = array_note(array);
-        section.table.add(severity(array),
-                          {trimmed(fmt::format("{} {}", array.number, array.kernel_name)),
-                           shown_level(array.level), shown_state(array),
-                           members_text(array, disks)},
+        std::vector<std::string> cells = {array_title(array), shown_level(array.level),
+                                          shown_state(array), members_text(array, disks)};
+        if (sized)
+            cells.insert(cells.begin() + 3, reported_size(array.size));
+        section.table.add(severity(array), std::move(cells),
                           note.empty() ? rebuild_text(array) : note);
     }
     return section;
@@ -228,8 +288,7 @@ Section array_list_section(const std::vector<ArrayReport> &arrays,
 
 Section array_show_section(const std::vector<ArrayReport> &arrays) {
     Section section = common_section(arrays);
-    for (const ArrayReport &array : arrays)
-        section.details.push_back(array_details(array));
+    add_details(section, arrays, array_details);
     return section;
 }
 

@@ -2,6 +2,9 @@
 #pragma once
 
 #include "answer.h"
+#include "slot_id.h"
+
+#include "zav_hwraid.h"
 
 #include <optional>
 #include <string>
@@ -10,14 +13,26 @@
 namespace zavctl {
 
 struct DiskReport {
-    int slot = 0;
+    int slot = 0; // in its enclosure
+    int unit = 0; // the expansion unit that holds it, 0: none
     Address address;
     int state = 0;             // ZAV_HDD_* bits
     bool expected = false;     // the model's arrays use this slot
     bool node_present = false; // the device node exists
+    double size = 0;           // as the RAID controller's report gives it, 0 if not told
+    std::string raid_set;      // its name, "" if not told
     std::string doubt;         // why the answer cannot be trusted, "" if it can
     std::optional<Failure> failure;
 };
+
+// "3", "2-3".
+std::string disk_name(const DiskReport &disk);
+
+// Whether the RAID controller's report tells of it: no device node and no tool does.
+bool is_reported(const DiskReport &disk);
+
+// Adds what updateData answered about the disk's enclosure.
+void tell_enclosure(DiskReport &disk, int result, const sRaidSetInfo &set);
 
 // "found", "absent", "failed", "unknown".
 std::string disk_state_word(const DiskReport &disk);

@@ -1,5 +1,7 @@
 #include "group_report.h"
 
+#include "verdict.h"
+
 #include "zav_event.h"
 
 #include <fmt/format.h>
@@ -51,15 +53,11 @@ std::string volumes_text(const GroupReport &group) {
 }
 
 Section common_section(const std::vector<GroupReport> &groups) {
-    Section section;
-    section.key = "volume_groups";
-    for (const GroupReport &group : groups)
-        section.records.push_back(group_json(group));
-    section.findings = group_findings(groups);
+    Section section = section_of("volume_groups", groups, group_json, finding);
     const auto normal = std::count_if(groups.begin(), groups.end(), [](const GroupReport &group) {
         return group.state == ZAV_LVM_NORMAL && severity(group) == Severity::ok;
     });
-    section.well = fmt::format("{} volume {} normal", normal, normal == 1 ? "group" : "groups");
+    section.well = counted(static_cast<std::size_t>(normal), "volume group", "normal");
     return section;
 }
 
@@ -73,10 +71,7 @@ Details group_details(const GroupReport &group) {
                     fmt::format("{} on {}", group.pv_count, devices_text(group)));
         details.add("Logical volumes", fmt::format("{}: {}", group.lv_count, volumes_text(group)));
     }
-    if (!group_note(group).empty())
-        details.add("Note", group_note(group));
-    if (!group.doubt.empty())
-        details.add("Doubt", group.doubt, Severity::unknown);
+    add_verdict(details, group_note(group), group.doubt);
     return details;
 }
 
@@ -184,10 +179,7 @@ Json group_json(const GroupReport &group) {
     for (const Address &device : group.devices)
         json["devices"].push_back(device.device.disk == 0 ? Json(nullptr) : to_json(device));
     json["expected"] = group.expected;
-    json["severity"] = word(severity(group));
-    json["note"] = group_note(group);
-    json["doubt"] = group.doubt.empty() ? Json(nullptr) : Json(group.doubt);
-    json["error"] = to_json(group.failure);
+    add_verdict(json, severity(group), group_note(group), group.doubt, group.failure);
     return json;
 }
 
@@ -205,8 +197,7 @@ Section group_list_section(const std::vector<GroupReport> &groups) {
 
 Section group_show_section(const std::vector<GroupReport> &groups) {
     Section section = common_section(groups);
-    for (const GroupReport &group : groups)
-        section.details.push_back(group_details(group));
+    add_details(section, groups, group_details);
     return section;
 }
 

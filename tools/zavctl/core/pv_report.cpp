@@ -1,12 +1,11 @@
 #include "pv_report.h"
 
 #include "group_report.h"
+#include "verdict.h"
 
 #include "zav_event.h"
 
 #include <fmt/format.h>
-
-#include <algorithm>
 
 namespace zavctl {
 
@@ -34,16 +33,8 @@ std::string device_text(const PvReport &pv) {
 }
 
 Section common_section(const std::vector<PvReport> &pvs) {
-    Section section;
-    section.key = "physical_volumes";
-    for (const PvReport &pv : pvs) {
-        section.records.push_back(pv_json(pv));
-        if (severity(pv) != Severity::ok)
-            section.findings.push_back(finding(pv));
-    }
-    const auto normal = std::count_if(
-        pvs.begin(), pvs.end(), [](const PvReport &pv) { return severity(pv) == Severity::ok; });
-    section.well = fmt::format("{} physical {} normal", normal, normal == 1 ? "volume" : "volumes");
+    Section section = section_of("physical_volumes", pvs, pv_json, finding);
+    section.well = counted(count_well(pvs), "physical volume", "normal");
     return section;
 }
 
@@ -54,10 +45,7 @@ Details pv_details(const PvReport &pv) {
     details.add("Group", group_name(pv.id.group));
     details.add("Size", shown_size(pv.size));
     details.add("Device", device_text(pv));
-    if (!pv_note(pv).empty())
-        details.add("Note", pv_note(pv));
-    if (!pv.doubt.empty())
-        details.add("Doubt", pv.doubt, Severity::unknown);
+    add_verdict(details, pv_note(pv), pv.doubt);
     return details;
 }
 
@@ -116,10 +104,7 @@ Json pv_json(const PvReport &pv) {
     json["state_bits"] = pv.state;
     json["size_gb"] = pv.size > 0 ? Json(pv.size) : Json(nullptr);
     json["device"] = pv.device.device.disk == 0 ? Json(nullptr) : to_json(pv.device);
-    json["severity"] = word(severity(pv));
-    json["note"] = pv_note(pv);
-    json["doubt"] = pv.doubt.empty() ? Json(nullptr) : Json(pv.doubt);
-    json["error"] = to_json(pv.failure);
+    add_verdict(json, severity(pv), pv_note(pv), pv.doubt, pv.failure);
     return json;
 }
 
@@ -139,8 +124,7 @@ Section pv_list_section(const std::vector<PvReport> &pvs, int more) {
 
 Section pv_show_section(const std::vector<PvReport> &pvs) {
     Section section = common_section(pvs);
-    for (const PvReport &pv : pvs)
-        section.details.push_back(pv_details(pv));
+    add_details(section, pvs, pv_details);
     return section;
 }
 

@@ -53,6 +53,27 @@ std::size_t column_start(const std::vector<std::size_t> &widths, std::size_t col
     return start;
 }
 
+constexpr std::size_t branch_width = 4;
+
+struct Drawing {
+    const char *lines; // with box-drawing characters
+    const char *ascii;
+};
+
+Drawing drawing_of(Branch branch) {
+    switch (branch) {
+    case Branch::to_row:
+        return {"├── ", "|-- "};
+    case Branch::to_last_row:
+        return {"└── ", "`-- "};
+    case Branch::past:
+        return {"│   ", "|   "};
+    case Branch::ended:
+        break;
+    }
+    return {"    ", "    "};
+}
+
 void strip_line_end(std::string &out) {
     while (!out.empty() && out.back() == ' ')
         out.pop_back();
@@ -147,12 +168,20 @@ std::string listed(const std::vector<std::string> &words) {
     return result;
 }
 
+std::string drawn(const std::vector<Branch> &branches, const Style &style) {
+    std::string text;
+    for (const Branch branch : branches)
+        text += style.unicode ? drawing_of(branch).lines : drawing_of(branch).ascii;
+    return text;
+}
+
 std::vector<std::size_t> Table::widths() const {
     std::vector<std::size_t> result;
     for (std::size_t i = 0; i < headings_.size(); ++i) {
         result.push_back(columns(headings_[i]));
         for (const Row &row : rows_)
-            result[i] = std::max(result[i], columns(row.cells[i]));
+            result[i] = std::max(result[i], columns(row.cells[i]) +
+                                                (i == 0 ? row.branches.size() * branch_width : 0));
     }
     return result;
 }
@@ -164,7 +193,8 @@ void Table::write_row(std::string &out, const Row &row, const std::vector<std::s
     const std::vector<std::string> lines = wrapped(row.cells[last], room(style, start));
     out += " " + coloured(mark(row.severity), row.severity, style) + "  ";
     for (std::size_t i = 0; i <= last; ++i) {
-        const std::string &cell = i == last ? lines[0] : row.cells[i];
+        const std::string text = i == last ? lines[0] : row.cells[i];
+        const std::string cell = i == 0 ? drawn(row.branches, style) + text : text;
         const std::string shown = i == state_column_ ? coloured(cell, row.severity, style) : cell;
         out += padded(shown, columns(cell), i == last ? 0 : widths[i] + gap);
     }

@@ -10,10 +10,12 @@
 
 namespace zavctl {
 
-// How the screen is written: colours or not, and where lines end (0: nowhere).
+// How the screen is written: colours or not, where lines end (0: nowhere), and whether characters
+// beyond ASCII can be shown.
 struct Style {
     bool colour = false;
     std::size_t width = 0;
+    bool unicode = false;
 };
 
 // Text that came from the system, made safe for a terminal: control characters, bytes that are no
@@ -42,6 +44,17 @@ std::vector<std::string> wrapped(std::string_view text, std::size_t width);
 // "one", "one and two", "one, two and three".
 std::string listed(const std::vector<std::string> &words);
 
+// One step of the way from the root of a tree to a row.
+enum class Branch {
+    to_row,      // the row hangs here, others below it
+    to_last_row, // the row hangs here, the last
+    past,        // a branch goes by on its way down
+    ended,       // nothing
+};
+
+// The branches before a row; each takes four columns.
+std::string drawn(const std::vector<Branch> &branches, const Style &style);
+
 // A table: one heading per column, one mark per row, and a column whose text takes the colour of
 // its row's severity. The last column, and what stands below it, is wrapped at the end of the
 // screen.
@@ -50,7 +63,8 @@ class Table {
     struct Row {
         Severity severity = Severity::ok;
         std::vector<std::string> cells;
-        std::string below; // a line of its own under the last column, "" for none
+        std::string below;              // a line of its own under the last column, "" for none
+        std::vector<Branch> branches{}; // of the tree that leads to the row, drawn before its text
     };
 
     Table() = default;
@@ -59,6 +73,10 @@ class Table {
 
     void add(Severity severity, std::vector<std::string> cells, std::string below = "") {
         rows_.push_back({severity, std::move(cells), std::move(below)});
+    }
+    void add_branch(Severity severity, std::vector<Branch> branches,
+                    std::vector<std::string> cells) {
+        rows_.push_back({severity, std::move(cells), "", std::move(branches)});
     }
     bool empty() const { return headings_.empty(); }
     std::string text(const Style &style) const;

@@ -1,12 +1,12 @@
 #include "volume_report.h"
 
 #include "group_report.h"
+#include "verdict.h"
 
 #include "zav_event.h"
 
 #include <fmt/format.h>
 
-#include <algorithm>
 #include <charconv>
 
 namespace zavctl {
@@ -96,17 +96,8 @@ Finding finding(const VolumeReport &volume) {
 }
 
 Section common_section(const std::vector<VolumeReport> &volumes) {
-    Section section;
-    section.key = "logical_volumes";
-    for (const VolumeReport &volume : volumes) {
-        section.records.push_back(volume_json(volume));
-        if (severity(volume) != Severity::ok)
-            section.findings.push_back(finding(volume));
-    }
-    const auto normal =
-        std::count_if(volumes.begin(), volumes.end(),
-                      [](const VolumeReport &volume) { return severity(volume) == Severity::ok; });
-    section.well = fmt::format("{} {} normal", normal, normal == 1 ? "volume" : "volumes");
+    Section section = section_of("logical_volumes", volumes, volume_json, finding);
+    section.well = counted(count_well(volumes), "volume", "normal");
     return section;
 }
 
@@ -121,10 +112,7 @@ Details volume_details(const VolumeReport &volume) {
     details.add("Device", volume.address.path.empty() ? "-" : volume.address.path);
     details.add("Mount point",
                 volume.mount_point + (volume.mounted ? "" : " (nothing is mounted there)"));
-    if (!volume_note(volume).empty())
-        details.add("Note", volume_note(volume));
-    if (!volume.doubt.empty())
-        details.add("Doubt", volume.doubt, Severity::unknown);
+    add_verdict(details, volume_note(volume), volume.doubt);
     return details;
 }
 
@@ -214,10 +202,7 @@ Json volume_json(const VolumeReport &volume) {
     json["usage_percent"] = percent ? Json(*percent) : Json(nullptr);
     json["mount_point"] = volume.mount_point;
     json["mounted"] = volume.mounted;
-    json["severity"] = word(severity(volume));
-    json["note"] = volume_note(volume);
-    json["doubt"] = volume.doubt.empty() ? Json(nullptr) : Json(volume.doubt);
-    json["error"] = to_json(volume.failure);
+    add_verdict(json, severity(volume), volume_note(volume), volume.doubt, volume.failure);
     return json;
 }
 
@@ -237,8 +222,7 @@ Section volume_list_section(const std::vector<VolumeReport> &volumes, int more) 
 
 Section volume_show_section(const std::vector<VolumeReport> &volumes) {
     Section section = common_section(volumes);
-    for (const VolumeReport &volume : volumes)
-        section.details.push_back(volume_details(volume));
+    add_details(section, volumes, volume_details);
     return section;
 }
 

@@ -5,6 +5,7 @@
 #include <cerrno>
 #include <csignal>
 #include <cstdlib>
+#include <cstring>
 #include <fcntl.h>
 #include <string_view>
 #include <unistd.h>
@@ -51,6 +52,16 @@ std::size_t terminal_width(int descriptor) {
     if (ioctl(descriptor, TIOCGWINSZ, &size) != 0)
         return 0;
     return size.ws_col;
+}
+
+// By the name of the locale alone: it may not be installed, and still be what the terminal shows.
+bool characters_are_utf8() {
+    for (const char *name : {"LC_ALL", "LC_CTYPE", "LANG"}) {
+        const char *value = std::getenv(name);
+        if (value != nullptr && *value != '\0')
+            return strcasestr(value, "utf-8") != nullptr || strcasestr(value, "utf8") != nullptr;
+    }
+    return false;
 }
 
 // 0, or errno of the failure.
@@ -116,6 +127,7 @@ Style Streams::style(const std::string &when) const {
     const bool wanted = out_is_terminal() && !environment_says("NO_COLOR") && !terminal_is_dumb();
     style.colour = when == "always" || (when == "auto" && wanted);
     style.width = out_is_terminal() ? terminal_width(out_) : 0;
+    style.unicode = characters_are_utf8();
     return style;
 }
 
