@@ -38,6 +38,14 @@ TEST(Launcher, AnswersWrongUsageWith64) {
     EXPECT_EQ(zavsim({"--shell", "zsh", "--", "true"}).status, 64);
     EXPECT_EQ(zavsim({"--model", "2860-2", "--level", "raid5", "--", "true"}).status, 64);
     EXPECT_EQ(zavsim({"--scenario", "/no/such/file", "--", "true"}).status, 64);
+    for (const char *units : {"8", "-1", "x", ""})
+        EXPECT_EQ(zavsim({"--model", "2980", "--units", units, "--", "true"}).status, 64) << units;
+}
+
+TEST(Launcher, HasUnitsForTheModelThatTakesThem) {
+    const Outcome run = zavsim({"--units", "2", "--", "true"});
+    EXPECT_EQ(run.status, 64);
+    EXPECT_EQ(run.err, "zavsim: model 2860-4 has no expansion units, --units does not apply\n");
 }
 
 TEST(Launcher, PassesTextsOnAsTheirBytes) {
@@ -51,8 +59,8 @@ TEST(Launcher, HelpsWithEverything) {
     const Outcome run = zavsim({"--help"});
     EXPECT_EQ(run.status, 0);
     for (const char *word :
-         {"--model", "--product", "--serial", "--raidtype", "--level", "--tools", "--time-scale",
-          "--scenario", "--shell", "--bare", "zavsim act", "zavsim state", "hangs"})
+         {"--model", "--product", "--serial", "--raidtype", "--level", "--units", "--tools",
+          "--time-scale", "--scenario", "--shell", "--bare", "zavsim act", "zavsim state", "hangs"})
         EXPECT_NE(run.out.find(word), std::string::npos) << word;
 }
 

@@ -49,6 +49,10 @@ State appliance(const std::string &model, const std::string &level) {
     return new_appliance({model, level, true, 1});
 }
 
+State with_units(int units) {
+    return new_appliance({"2980", "", false, 1, false, units});
+}
+
 State four_disks(const std::string &level) {
     return appliance("2860-4", level);
 }

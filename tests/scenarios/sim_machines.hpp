@@ -8,6 +8,7 @@
 #include <vector>
 
 zavsim::State appliance(const std::string &model, const std::string &level = "");
+zavsim::State with_units(int units); // a 2980
 zavsim::State four_disks(const std::string &level = "");
 zavsim::State after(zavsim::State state, const std::vector<std::string> &sentences);
 zavsim::Array &array(zavsim::State &state, int minor);

@@ -5,6 +5,7 @@
 #include <stdlib.h>
 #include <string.h>
 #include <sys/ioctl.h>
+#include <sys/sem.h>
 #include <sys/vfs.h>
 #include <time.h>
 #include <unistd.h>
@@ -96,6 +97,31 @@ static void probe_statfs(const char *path) {
     print_blocks(result, record64.f_blocks, record64.f_bfree, record64.f_bavail);
 }
 
+/* The semaphore of the RAID controller's report. */
+static int step_semaphore(short direction) {
+    struct sembuf operation = {0, direction, SEM_UNDO};
+    return semop(semget(0x6912, 1, 0), &operation, 1);
+}
+
+/* Holds it from the moment at which the file exists until standard input ends. */
+static void probe_hold(const char *file) {
+    printf("took %s\n", verdict(step_semaphore(-1)));
+    close(open(file, O_WRONLY | O_CREAT, 0600));
+    while (getchar() != EOF)
+        ;
+    printf("gave back %s\n", verdict(step_semaphore(1)));
+}
+
+/* Reads a file as the report's readers do. */
+static void probe_read(const char *file) {
+    char text[8192];
+    step_semaphore(-1);
+    FILE *in = fopen(file, "r");
+    const size_t size = in == NULL ? 0 : fread(text, 1, sizeof text, in);
+    fwrite(text, 1, size, stdout);
+    step_semaphore(1);
+}
+
 int main(int argc, char **argv) {
     const char *what = argc > 1 ? argv[1] : "";
     if (strcmp(what, "sleep") == 0)
@@ -106,6 +132,10 @@ int main(int argc, char **argv) {
         probe_queue(argv[2], (size_t)atoi(argv[3]));
     else if (strcmp(what, "statfs") == 0 && argc == 3)
         probe_statfs(argv[2]);
+    else if (strcmp(what, "hold") == 0 && argc == 3)
+        probe_hold(argv[2]);
+    else if (strcmp(what, "read") == 0 && argc == 3)
+        probe_read(argv[2]);
     else if (strcmp(what, "private") == 0)
         probe_private();
     else

@@ -46,6 +46,64 @@ TEST(Sentences, SayWhatHappensToATool) {
     EXPECT_EQ(parse_sentence(R"(tool mdadm prints "a \"b\" # c\n")").action.text, "a \"b\" # c\n");
 }
 
+TEST(Sentences, SayWhatHappensToAControllersVolume) {
+    const Action degraded = parse_sentence("controller volume 2 degrades").action;
+    EXPECT_EQ(degraded.kind, Action::Kind::raid_volume_degrades);
+    EXPECT_EQ(degraded.unit, 0);
+    EXPECT_EQ(degraded.number, 2);
+    const Action rebuilt = parse_sentence("unit 7 volume rebuilds").action;
+    EXPECT_EQ(rebuilt.kind, Action::Kind::raid_volume_rebuilds);
+    EXPECT_EQ(rebuilt.unit, 7);
+    EXPECT_EQ(rebuilt.number, 1);
+    EXPECT_EQ(parse_sentence("unit 1 volume fails").action.kind, Action::Kind::raid_volume_fails);
+    EXPECT_EQ(parse_sentence("controller volume 1 recovers").action.kind,
+              Action::Kind::raid_volume_recovers);
+}
+
+TEST(Sentences, SayWhatHappensToAUnit) {
+    const Action failed = parse_sentence("unit 3 disk 4 fails").action;
+    EXPECT_EQ(failed.kind, Action::Kind::disk_fails);
+    EXPECT_EQ(failed.unit, 3);
+    EXPECT_EQ(failed.number, 4);
+    EXPECT_EQ(parse_sentence("unit 3 vanishes").action.kind, Action::Kind::unit_vanishes);
+    EXPECT_EQ(parse_sentence("unit 3 appears").action.kind, Action::Kind::unit_appears);
+    EXPECT_EQ(parse_sentence("unit 3 loses its link").action.kind, Action::Kind::unit_loses_link);
+    EXPECT_EQ(parse_sentence("unit 3 finds its link").action.kind, Action::Kind::unit_finds_link);
+}
+
+TEST(Sentences, SayWhatTheHardwareMonitorReads) {
+    const Action hot = parse_sentence("unit 3 temperature 88.5").action;
+    EXPECT_EQ(hot.kind, Action::Kind::temperature_changes);
+    EXPECT_EQ(hot.unit, 3);
+    EXPECT_DOUBLE_EQ(hot.value, 88.5);
+    EXPECT_DOUBLE_EQ(parse_sentence("unit 3 voltage 1.15").action.value, 1.15);
+    EXPECT_EQ(parse_sentence("unit 3 voltage 1").action.kind, Action::Kind::voltage_changes);
+    EXPECT_EQ(parse_sentence("controller temperature 0").action.unit, 0);
+}
+
+TEST(Sentences, SayWhatHappensToTheReport) {
+    EXPECT_EQ(parse_sentence("report is missing").action.kind, Action::Kind::report_is_missing);
+    EXPECT_EQ(parse_sentence("report is truncated").action.kind, Action::Kind::report_is_truncated);
+    EXPECT_EQ(parse_sentence("report is garbled").action.kind, Action::Kind::report_is_garbled);
+    EXPECT_EQ(parse_sentence("report works again").action.kind, Action::Kind::report_works);
+    const Action rewritten = parse_sentence("report rewrites 1.5m").action;
+    EXPECT_EQ(rewritten.kind, Action::Kind::report_rewrites);
+    EXPECT_DOUBLE_EQ(rewritten.seconds, 90);
+}
+
+TEST(Sentences, TellTheRangesOfTheirNumbers) {
+    EXPECT_EQ(parse_sentence("unit 8 vanishes").error, "unit wants a number from 1 to 7");
+    EXPECT_EQ(parse_sentence("unit 0 vanishes").error, "unit wants a number from 1 to 7");
+    EXPECT_EQ(parse_sentence("unit 3 disk 5 fails").error,
+              "unit 3 disk wants a number from 1 to 4");
+    EXPECT_EQ(parse_sentence("controller volume 3 fails").error,
+              "controller volume wants a number from 1 to 2");
+    EXPECT_EQ(parse_sentence("unit 3 temperature 201").error,
+              "unit 3 temperature wants degrees from 0 to 200, such as 88 or 61.5");
+    EXPECT_EQ(parse_sentence("unit 3 voltage 20.01").error,
+              "unit 3 voltage wants volts from 0 to 20, such as 1.1");
+}
+
 TEST(Sentences, RefuseWhatTheyDoNotMean) {
     for (const char *text : {"",
                              "disk",
@@ -82,6 +140,35 @@ TEST(Sentences, RefuseWhatTheyDoNotMean) {
                              "tool mdadm prints \"text",
                              "tool mdadm is broken",
                              "tool mdadm works",
+                             "controller",
+                             "controller volume",
+                             "controller volume 1",
+                             "controller volume 1 explodes",
+                             "controller voltage 1.2",
+                             "controller vanishes",
+                             "unit",
+                             "unit 3",
+                             "unit 3 explodes",
+                             "unit 3 vanishes now",
+                             "unit 3 loses",
+                             "unit 3 disk 1",
+                             "unit 3 disk 1 joins",
+                             "unit 3 volume",
+                             "unit 3 volume 1 fails",
+                             "unit 3 temperature",
+                             "unit 3 temperature -1",
+                             "unit 3 temperature 88.55",
+                             "unit 3 temperature 88.",
+                             "unit 3 temperature .5",
+                             "unit 3 temperature hot",
+                             "unit 3 voltage 1.155",
+                             "unit 3 voltage 1.1.1",
+                             "report",
+                             "report is",
+                             "report is wrong",
+                             "report works",
+                             "report rewrites",
+                             "report rewrites 5",
                              "fan 1 stops"})
         EXPECT_NE(parse_sentence(text).error, "") << text;
 }
