@@ -304,8 +304,8 @@ char *getTableEntrySMBIOS(int type);
  *
  * On the motherboard (SATA) presence is told by the device node, health by the exit status of
  * "smartctl -H -d ata". Disks of the RAID controller (HWSATA, slots 1 to 4, model 2980 only) and of
- * an expansion unit (SAS: unit 1 to 7 in bits 8 to 15 of `disk`, slot 1 to 4 in the rest) are looked
- * up in the controller's report, see updateData.
+ * an expansion unit (SAS: unit 1 to 7 in bits 8 to 15 of `disk`, slot 1 to 4 in the rest) are
+ * looked up in the controller's report, see updateData.
  *
  * ZAV_RC_OK          info->state is ZAV_HDD_FOUND, _ABSENT or _FAILED; smartctl's exit status 2
  *                    (cannot open the device) is absent, every other but 0 is failed. From the
@@ -351,10 +351,10 @@ int getDiskStateSAS(zavDevice *dev, zavHddState *info);
  *
  * State, `resync` and `raidcount` (disks of the RAID set) of a volume are the report's numbers as
  * they stand. Its level is ZAV_RAIDLVL_5 for the report's level 3, ZAV_RAIDLVL_1 for level 1
- * (ZAV_RAIDLVL_10 in a set of four), else ZAV_RAIDLVL_0. `hdddev` has the enclosure's four slots; one
- * whose disk has no size has type and minor type 0. ZAV_RAID_NOT_EXIST if the node or the report's
- * section is missing. The report is read once for the volume and again for every disk: between
- * these it may be rewritten.
+ * (ZAV_RAIDLVL_10 in a set of four), else ZAV_RAIDLVL_0. `hdddev` has the enclosure's four slots;
+ * one whose disk has no size has type and minor type 0. ZAV_RAID_NOT_EXIST if the node or the
+ * report's section is missing. The report is read once for the volume and again for every disk:
+ * between these it may be rewritten.
  *
  * ZAV_RC_OK          as above; ZAV_RAID_NOT_EXIST comes with level ZAV_RAIDLVL_NONE
  * ZAV_RC_ERR_EINVAL  null pointer, types or model (record untouched); array or partition number
@@ -436,16 +436,16 @@ int zavGetRaidCardHwMon(int item, double *value);
 /**
  * The expansion units that hang behind the controller now, unit n in element n-1: address, serial
  * number, model, numbers of the neighbours (parentid 0 is the controller, -1 means no unit on that
- * link; the numbers follow the place in the cascade: n/2 above, 2n and 2n+1 below). The list of units
- * and addresses is also written to /etc/Kiru/zav/.RBODinfo; a disk too full for it is not
+ * link; the numbers follow the place in the cascade: n/2 above, 2n and 2n+1 below). The list of
+ * units and addresses is also written to /etc/Kiru/zav/.RBODinfo; a disk too full for it is not
  * reported.
  *
  * The cascade is what /usr/bin/query_sas.sh prints, of which at most seven expanders are taken; one
  * that unit 1 does not lead to, or that would be numbered above 7, is left out. Serial number and
  * model come from the report and are empty where it does not have the unit.
  *
- * The record is filled with bytes 0xFF first. An element without a unit has iExist 0 and stays so in
- * the rest.
+ * The record is filled with bytes 0xFF first. An element without a unit has iExist 0 and stays so
+ * in the rest.
  *
  * ZAV_RC_OK          filled; no units at all, and a script that is missing or prints nothing, are
  *                    no failure
@@ -503,8 +503,8 @@ void getsasaddr(char *line, char *sasaddr);
  *                    ZAV_RBOD_WARN, from 85 on ZAV_RBOD_ALARM
  * ZAV_RBOD_VOLT_CPU  `value` in volts: between 1.08 and 1.32 ZAV_RBOD_NORMAL, up to 0.96 and from
  *                    1.44 on ZAV_RBOD_ALARM, in between ZAV_RBOD_WARN. A report's 1.08 is NORMAL,
- *                    its 1.32 is WARN, its 1.44 and 0.96 are ALARM: the reading has single precision.
- * any other          ZAV_RBOD_NORMAL
+ *                    its 1.32 is WARN, its 1.44 and 0.96 are ALARM: the reading has single
+ * precision. any other          ZAV_RBOD_NORMAL
  *
  * ZAV_RC_OK          as above. A value of 0 may also be a monitor line that is missing.
  * ZAV_RC_ERR_EINVAL  null pointer, number of the unit; record untouched
@@ -782,6 +782,286 @@ int zavLVMHotAdd(zavDevice *dev, zavDevice *lvmdev);
  * vgremove asks on the caller's standard input when volumes are left: leave nothing there to read.
  */
 int zavLVMHotRemove(zavDevice *lvmdev);
+
+/* ==== Sensors =================================================================================
+ *
+ * The sensors of the appliance's own driver, small files under /proc/zav/sys/. The records can
+ * travel as events. `state` is ZAV_SENSOR_NORMAL, _WARNING, _CRITICAL (also: an alarm is latched)
+ * or _ERR (not known).
+ */
+
+/**
+ * A temperature in degrees Celsius: probes 1 to 3 of the main board (sensor/tempLT, tempRT1,
+ * tempRT2), and 4, the RAID controller's (zavGetRaidCardHwMon, item 0; model 2980). A probe is
+ * WARNING from 65, 60, 90 and 90 on, CRITICAL from 75, 70, 100 and 95 on. An alarm that is latched
+ * in the probe's status file is CRITICAL whatever the temperature.
+ *
+ * ZAV_RC_OK          filled
+ * ZAV_RC_ERR_EINVAL  null pointer, probe number; record untouched
+ * ZAV_RC_ERR_EACCES  a file cannot be opened or is empty (logged); the controller gives no reading
+ * ZAV_RC_ERR_ENODEV  probe 4 on another model
+ *
+ * After the last two the state is ZAV_SENSOR_ERR and the value 0.
+ */
+int zavGetStateThermal(int probeno, zavThermalState *info);
+
+/**
+ * A voltage in volts: probes 1 to 5 (sensor/volVTT, vol18V, vol5V, vol12V, volVccp). CRITICAL at or
+ * beyond 0.96 and 1.44, 1.44 and 2.16, 4.0 and 6.0, 9.6 and 14.4, 0.54 and 1.76; WARNING at or
+ * beyond 1.08 and 1.32, 1.62 and 1.98, 4.5 and 5.5, 10.8 and 13.2, 0.6 and 1.6. A latched alarm is
+ * CRITICAL; a status file that holds neither 0 nor 1 gives ZAV_SENSOR_ERR with ZAV_RC_OK. Codes as
+ * for zavGetStateThermal.
+ */
+int zavGetStateVolt(int probeno, zavVoltageState *info);
+
+/**
+ * Clears the latched alarm of a probe. The RAID controller (thermal probe 4) has none: there the
+ * answer tells whether it can be asked.
+ *
+ * ZAV_RC_OK          cleared
+ * ZAV_RC_ERR_EINVAL  probe number
+ * ZAV_RC_ERR_EACCES  the status file cannot be opened (logged) or written; no reading of the
+ *                    controller
+ */
+int zavResetThermal(int probeno);
+int zavResetVolt(int probeno);
+
+/**
+ * Speed of a fan as its file gives it now: fans 1, 2, 3 are the files sensor/fan2, fan3 and fan1,
+ * fan 4 is the GPIO line 27, which is 1 while the fan turns.
+ *
+ * ZAV_RC_OK          read
+ * ZAV_RC_ERR_EINVAL  null pointer, fan number
+ * ZAV_RC_ERR_EACCES  the file cannot be opened or is empty (logged); `*fanspeed` is untouched
+ */
+int zavReadFanSpeed(int fan, float *fanspeed);
+
+/**
+ * State of a fan. NORMAL above its minimum (800, 1500, 1500, 0), CRITICAL at 0 and below, else
+ * WARNING. One that is not above its minimum is read up to three times, 3 seconds apart, and the
+ * last reading counts; fan 4 only if it reads below 0, 1 second apart.
+ *
+ * ZAV_RC_OK          filled
+ * ZAV_RC_ERR_EINVAL  null pointer, fan number; record untouched
+ * ZAV_RC_ERR_EACCES  as zavReadFanSpeed; state ZAV_SENSOR_ERR, the value means nothing
+ *
+ * Blocks about 6 seconds for a fan that is slow or stands still.
+ */
+int zavGetStateFan(int fan, zavFanState *info);
+
+/**
+ * The byte of the digital sensor ports (/proc/zav/sys/dev/serio/in), and the one to set (out).
+ *
+ * ZAV_RC_OK          read, or written
+ * ZAV_RC_ERR_EINVAL  null pointer
+ * ZAV_RC_ERR_EACCES  the file cannot be opened (logged), holds no hexadecimal number, or does not
+ *                    take the byte (logged); `*state` is untouched
+ */
+int zavGetSensorIn(unsigned char *state);
+int zavSetSensorOut(unsigned char *state);
+
+/* ==== System load =============================================================================*/
+
+/**
+ * Load of the appliance's own computer in percent, by probe: 0x101 processor (measured over 10
+ * seconds), 0x102 swap, and file systems: 0x103 "/", 0x105 "/var", 0x106 "/tmp", 0x107
+ * "/mnt/buffer". The state is ZAV_SYSINFO_CRITICAL above 95, _WARNING above 90, else _NORMAL; for
+ * swap above 10 and above 0.
+ *
+ * ZAV_RC_OK          filled
+ * ZAV_RC_ERR_EINVAL  null pointer; another probe, 0x104 among them; record untouched
+ * others             as cpuinfo, meminfo and fsinfo return them; value 0, ZAV_SYSINFO_ERR
+ *
+ * Blocks 10 seconds for the processor.
+ */
+int zavGetStateSysinfo(int probeno, zavSysinfoState *info);
+
+/**
+ * Use of the processor over `sec` seconds, from the counters for user, nice, system and idle time
+ * in /proc/stat; others take no part. An interval in which nothing was counted is idle.
+ *
+ * ZAV_RC_OK          filled
+ * ZAV_RC_ERR_EINVAL  null pointer, negative time
+ * ZAV_RC_ERR_EACCES  /proc/stat cannot be opened (logged); record untouched
+ */
+int cpuinfo(pCpuInfo info, int sec);
+
+/**
+ * Memory (1) or swap (2) in use, in percent of all there is; 0 for any other number and where there
+ * is none. Buffers and caches of the kernel count as memory in use. From /proc/meminfo.
+ *
+ * ZAV_RC_OK          measured
+ * ZAV_RC_ERR_EINVAL  null pointer
+ * ZAV_RC_ERR_ENOMEM  no memory
+ * ZAV_RC_ERR_EACCES  /proc/meminfo cannot be opened (logged)
+ *
+ * `*usage` is untouched in every failure.
+ */
+int meminfo(int memno, float *usage);
+
+/**
+ * How full a file system is for ordinary users, in percent: 1 "/", 2 "/etc/Kiru", 3 "/var", 4
+ * "/tmp", 5 "/mnt/buffer". An empty one is 0. It has to be listed in /etc/mtab under exactly that
+ * name.
+ *
+ * ZAV_RC_OK          measured
+ * ZAV_RC_ERR_EINVAL  null pointer, number
+ * ZAV_RC_ERR_ENOMEM  no memory
+ * ZAV_RC_ERR_EACCES  /etc/mtab cannot be opened (logged)
+ * ZAV_RC_ERR_ENODEV  not mounted
+ * ZAV_RC_ERR         statfs failed
+ *
+ * `*usage` is untouched in every failure.
+ */
+int fsinfo(int fsno, float *usage);
+
+/* ==== LEDs ====================================================================================*/
+
+/**
+ * Sets or asks LED 1 to 6 of the front panel, a GPIO line each. States are ZAV_LED_OFF, ZAV_LED_ON
+ * and, to be set for LED 5 only, ZAV_LED_VALUE2. zavGetLED returns the state or a code.
+ *
+ * ZAV_RC_OK          set
+ * ZAV_RC_ERR_EINVAL  LED; state: its line has been opened for writing all the same
+ * ZAV_RC_ERR_ENOENT  the line cannot be opened (logged)
+ * ZAV_RC_ERR         it cannot be written or read (logged), or holds another number
+ */
+int zavSetLED(int led, int state);
+int zavGetLED(int led);
+
+/**
+ * The same for the LEDs of disks 1 to 4, which are LEDs 7 to 10 and have two lines each. States are
+ * ZAV_LED_OFF and ZAV_HDDLED_*. On model 2980 these LEDs belong to the controller: ZAV_RC_ERR,
+ * whatever the arguments are.
+ */
+int zavSetHDDLED(int led, int state);
+int zavGetHDDLED(int led);
+
+/**
+ * Hands an alarm to the LED-event driver (/dev/zavledevent), which makes a pattern of it; takes a
+ * pending one from it.
+ *
+ * ZAV_RC_OK          done
+ * 0x1201             zavLEDPollAlarm: none is pending; the record is all zero
+ * ZAV_RC_ERR_EINVAL  zavLEDPollAlarm: null pointer
+ * ZAV_RC_ERR_EACCES  the device cannot be opened (logged): it is missing, or somebody else has it
+ * ZAV_RC_ERR_ENOMEM  zavLEDAlarm: the driver's queue is full (logged)
+ * ZAV_RC_ERR         the driver refuses (logged)
+ */
+int zavLEDAlarm(int priority, int ledcode, int state);
+int zavLEDPollAlarm(zavLEDEvent *ledevent);
+
+/* ==== Events ==================================================================================
+ *
+ * The appliance's event driver keeps a queue of records and a private one. Its device,
+ * /dev/zavevent0, is opened for each call, by one caller at a time: while somebody waits in
+ * zavWaitEvent all others are told ZAV_RC_ERR_EACCES.
+ */
+
+/**
+ * Takes the next event, if there is one, or the next private one. The record is cleared first.
+ *
+ * ZAV_RC_OK          taken; event->type tells which record it is
+ * 0x1201             none is there; the record is all zero
+ * ZAV_RC_ERR_EINVAL  null pointer; zavPollPrivateEvent logs it
+ * ZAV_RC_ERR_EACCES  the device cannot be opened (logged); zavPollEvent leaves the record untouched
+ * ZAV_RC_ERR         the driver answered with a number that it does not have (logged)
+ */
+int zavPollEvent(zavSystemEvent *event);
+int zavPollPrivateEvent(zavSystemEvent *event);
+
+/** The same, waiting until there is one; looked for once a second, without a limit. */
+int zavWaitEvent(zavSystemEvent *event);
+
+/**
+ * Puts an event into the queue, as it stands.
+ *
+ * ZAV_RC_OK          put
+ * ZAV_RC_ERR_EINVAL  null pointer
+ * ZAV_RC_ERR_EACCES  the device cannot be opened (logged)
+ * ZAV_RC_ERR_ENOMEM  the queue is full, as told by a driver that answers with the error itself
+ *                    (logged)
+ * ZAV_RC_ERR         refused, also because the queue is full
+ */
+int zavPushEvent(zavSystemEvent *event);
+
+/* ==== UPS =====================================================================================*/
+
+/**
+ * Charge and state of the UPS: from /var/log/apcupsd.status, which the UPS daemon writes, or from
+ * /var/log/zavapcupsd.event, which the appliance's hook writes, whichever is newer; the hook's if
+ * both are of the same second. The state is ZAV_UPS_ONBATT, _ONLINE or _OTHER, or the hook's
+ * number.
+ *
+ * ZAV_RC_OK          filled
+ * ZAV_RC_ERR_EINVAL  null pointer
+ * ZAV_RC_ERR_ENOMEM  no memory (logged)
+ * ZAV_RC_ERR_ENODEV  the daemon does not run: it has no status file, or both files are more than 90
+ *                    seconds old (logged)
+ * ZAV_RC_ERR_EACCES  a file cannot be opened, is empty, or the hook's has fewer than two fields
+ *                    (logged)
+ * 42                 the status file lacks LINEV, BCHARGE or STATUS (logged)
+ *
+ * The record is untouched in every failure.
+ */
+int zavGetStateUPS(zavUpsState *info);
+
+/* ==== Network interfaces ======================================================================*/
+
+/**
+ * Link and speed of an Ethernet port ({ZAV_DEV_NIC, ZAV_MINDEV_NIC_ETH, n, 0}, n from 1 to 4 is
+ * eth<n-1>) as ethtool tells them, or of a bond's active port (ZAV_MINDEV_NIC_BOND, n 1 or 2 is
+ * bond<n-1>). `value` is 1000, 100 or 10 Mbit/s, 0 if not known. The state is ZAV_NET_UP, _DOWN
+ * (also: a bond without an active port), _NOT_EXIST, or _ERR where ethtool tells no link.
+ *
+ * ZAV_RC_OK           as above
+ * ZAV_RC_ERR_EINVAL   null pointer, type, minor type (logged, record untouched); number
+ * ZAV_RC_ERR_ESTRPIPE no pipe to a tool
+ * ZAV_RC_ERR_NIC      ethtool tells another speed, such as 2500 or 10000, or a link that is neither
+ *                     yes nor no; the bond's active port is none of eth0 to eth3. What was read
+ *                     before is filled.
+ * ZAV_RC_ERR_ENODEV   the bonding driver does not name the active port: the bond is in a mode
+ *                     without one
+ *
+ * Otherwise the record is filled with value 0 and ZAV_NET_ERR. Blocks as long as ethtool takes,
+ * twice.
+ */
+int zavGetStateNic(zavDevice *dev, zavNetState *info);
+
+/** Readers by minor type. `info` comes with everything filled in. */
+int getNicStateETH(zavDevice *dev, zavNetState *info);
+int getNicStateBOND(zavDevice *dev, zavNetState *info);
+
+/* ==== Identity of an expansion unit ===========================================================
+ *
+ * The first volume of a unit, /dev/sasraid/r<id>disk1, carries the mark of the chassis that set it
+ * up: 4 bytes at offset 440, the disk signature of its master boot record.
+ */
+
+/**
+ * The mark of this chassis, 1 to 100000000: the digits of the board's serial number, others read as
+ * 0, modulo 100000000, plus 1. A number beyond 2147483647 is read as that.
+ *
+ * ZAV_RC_OK          computed
+ * ZAV_RC_ERR_EINVAL  null pointer
+ * others             as zavGetSerialBIOS returns them (logged); `*ccv` is untouched
+ */
+int zavMapRBODCCV(int *ccv);
+
+/**
+ * Writes the mark, or compares the one that is there: `*state` is ZAV_IRBOD_SAME, _UNMARKED (0) or
+ * _OTHER. rbod->id names the unit.
+ *
+ * 0       done
+ * 22      null pointer
+ * others  as zavMapRBODCCV returns them, or the error number of a failed system call (logged): 2
+ * for a unit without a volume, 5 for a volume that ends before the mark
+ *
+ * `*state` is untouched in every failure. What was written has reached the kernel, not yet the
+ * disk.
+ */
+int zavSetiRBOD(sRBOD *rbod);
+int zavGetiRBOD(sRBOD *rbod, int *state);
 
 #ifdef __cplusplus
 }

@@ -88,6 +88,10 @@ extern "C" {
 #define ZAV_SENSOR_CRITICAL 3
 #define ZAV_SENSOR_ERR 4
 
+#define ZAV_UPS_OTHER 2 /* neither of the next two */
+#define ZAV_UPS_ONBATT 5
+#define ZAV_UPS_ONLINE 7
+
 #define ZAV_SYSINFO_NORMAL 0x201
 #define ZAV_SYSINFO_WARNING 0x202
 #define ZAV_SYSINFO_CRITICAL 0x203
@@ -157,10 +161,19 @@ typedef struct zavSysinfoState {
     int state;   /* ZAV_SYSINFO_* */
 } zavSysinfoState;
 
+/* Use of the processor over an interval. */
+typedef struct CpuInfo {
+    long total; /* clock ticks in the interval */
+    float user; /* percent of them */
+    float nice;
+    float system;
+    float idle;
+} CpuInfo, *pCpuInfo;
+
 typedef struct zavUpsState {
     int type;     /* ZAV_EVENT_UPS */
     float charge; /* battery charge, percent */
-    int state;
+    int state;    /* ZAV_UPS_*, or what the appliance's UPS hook wrote */
 } zavUpsState;
 
 typedef struct zavHddState {

@@ -19,6 +19,11 @@ extern "C" {
 #define ZAV_RBOD_TEMP_CPU 0x1001
 #define ZAV_RBOD_VOLT_CPU 0x1002
 
+/* Does the mark on a unit's first volume name this chassis? (zavGetiRBOD) */
+#define ZAV_IRBOD_SAME 4608
+#define ZAV_IRBOD_UNMARKED 4609 /* the same number as 0x1201 */
+#define ZAV_IRBOD_OTHER 4610
+
 /* All strings below are NUL-terminated inside their arrays. */
 
 typedef struct sRBODMap {

@@ -29,6 +29,9 @@ class File {
             fclose(std::exchange(file_, nullptr));
     }
 
+    // Does all that was written reach the file?
+    bool flush() { return fflush(file_) == 0; }
+
     // One line of at most `size` - 1 characters, line feed included; false at the end.
     bool line(char *buffer, int size) { return fgets(buffer, size, file_) != nullptr; }
 
@@ -48,6 +51,9 @@ class Descriptor {
 
     explicit operator bool() const { return fd_ >= 0; }
     int get() const { return fd_; }
+
+    // Does the system say that everything went well?
+    bool close() { return ::close(std::exchange(fd_, -1)) == 0; }
 
   private:
     int fd_;

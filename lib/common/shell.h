@@ -46,6 +46,9 @@ class CommandOutput {
     // One line of at most `size` - 1 characters, line feed included; false at the end.
     bool line(char *buffer, int size) { return fgets(buffer, size, pipe_) != nullptr; }
 
+    // The same, but for what stands at the end of the output without a line feed.
+    bool finished_line(char *buffer, int size) { return line(buffer, size) && feof(pipe_) == 0; }
+
     // At most `size` bytes of all the output.
     size_t read(char *buffer, size_t size) { return fread(buffer, 1, size, pipe_); }
 

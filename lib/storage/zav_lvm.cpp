@@ -3,6 +3,7 @@
 #include "common/node.h"
 #include "common/shell.h"
 #include "common/text.h"
+#include "common/usage.h"
 #include "zav_api.h"
 
 #include <algorithm>
@@ -262,9 +263,8 @@ int zavgetFSusage(zavDevice *dev, float *usage) {
                   __func__, rc, errno, strerror(errno), path);
         return kUnmeasured;
     }
-    const auto free = static_cast<long double>(system.f_bavail);
-    const auto all = static_cast<long double>(system.f_blocks);
-    *usage = all == 0 ? 0.0F : static_cast<float>((1.0L - free / all) * 100.0L);
+    *usage = zav::used_percent(static_cast<long double>(system.f_bavail),
+                               static_cast<long double>(system.f_blocks));
     ZAV_TRACE(zav::kTraceStep, "%s() - usage: %2.2f\n", __func__, static_cast<double>(*usage));
     return ZAV_RC_OK;
 }

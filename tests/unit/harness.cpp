@@ -7,10 +7,12 @@
 #include <cstring>
 #include <ctime>
 #include <dlfcn.h>
+#include <fcntl.h>
 #include <filesystem>
 #include <fstream>
 #include <mutex>
 #include <sstream>
+#include <sys/ioctl.h>
 #include <sys/mman.h>
 #include <sys/sem.h>
 #include <sys/syscall.h>
@@ -87,9 +89,9 @@ Record &record() {
 
 // What tests put into the root. The bare root itself comes with the directories.
 constexpr const char *kWipedDirectories[] = {
-    "/etc/Kiru",        "/proc/zav",      "/proc/scsi",  "/sys/class",   "/dev/sata",
-    "/dev/swraid",      "/dev/iscsiraid", "/dev/hwraid", "/dev/sasraid", "/dev/DataVG1",
-    "/dev/PrimaryOSVG", "/sys/devices",   "/scratch"};
+    "/etc/Kiru",        "/proc/zav",      "/proc/scsi",        "/sys/class",   "/dev/sata",
+    "/dev/swraid",      "/dev/iscsiraid", "/dev/hwraid",       "/dev/sasraid", "/dev/DataVG1",
+    "/dev/PrimaryOSVG", "/sys/devices",   "/proc/net/bonding", "/scratch"};
 constexpr const char *kWipedFiles[] = {"/proc/mdstat",
                                        "/dev/nvram",
                                        "/dev/mem",
@@ -98,7 +100,15 @@ constexpr const char *kWipedFiles[] = {"/proc/mdstat",
                                        "/etc/sysconfig/clock",
                                        "/etc/arecaTimeZone.list",
                                        "/usr/bin/syncConf.sh",
-                                       "/usr/bin/query_sas.sh"};
+                                       "/usr/bin/query_sas.sh",
+                                       "/dev/zavevent0",
+                                       "/dev/zavledevent",
+                                       "/var/log/apcupsd.status",
+                                       "/var/log/zavapcupsd.event",
+                                       "/sbin/ethtool",
+                                       "/proc/stat",
+                                       "/proc/meminfo",
+                                       "/etc/mtab"};
 
 // The tests wipe directories of the system: never outside a private root.
 void require_private_root() {
@@ -117,7 +127,7 @@ Appliance::Appliance() {
         fs::create_directories(path);
     }
     for (const char *path : kWipedFiles)
-        fs::remove(path);
+        fs::remove_all(path);
     for (const int key : {0x6911, 0x6912, 0x3231}) {
         const int id = semget(key, 1, 0);
         if (id >= 0)
@@ -290,6 +300,29 @@ int semop(int id, sembuf *operations, size_t count) {
         return -1;
     }
     return harness::real<int(int, sembuf *, size_t)>("semop")(id, operations, count);
+}
+
+// Only the appliance's drivers are asked by requests.
+int ioctl(int /*descriptor*/, unsigned long request, ...) noexcept {
+    va_list arguments;
+    va_start(arguments, request);
+    void *argument = va_arg(arguments, void *);
+    va_end(arguments);
+    harness::record().requests.push_back(request);
+    if (harness::record().driver)
+        return harness::record().driver(request, argument);
+    errno = EAGAIN;
+    return -1;
+}
+
+int open(const char *path, int flags, ...) {
+    va_list arguments;
+    va_start(arguments, flags);
+    const int mode = (flags & O_CREAT) != 0 ? va_arg(arguments, int) : 0;
+    va_end(arguments);
+    if (harness::record_is_ready && strncmp(path, "/dev/zav", 8) == 0)
+        harness::record().driver_flags.push_back(flags);
+    return static_cast<int>(syscall(SYS_openat, AT_FDCWD, path, flags, mode));
 }
 
 time_t time(time_t *result) noexcept {

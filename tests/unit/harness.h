@@ -75,7 +75,10 @@ struct Record {
     std::function<bool(short)> semop_fails; // told the operation: -1 takes, 1 releases
     std::vector<time_t> times;              // what time() answers, the last for ever; -1 fails
     std::optional<struct statfs> file_system;
-    std::string measured; // the path given to statfs
+    std::string measured;          // the path given to statfs
+    std::vector<int> driver_flags; // with which a driver's device was opened
+    std::vector<unsigned long> requests;
+    std::function<int(unsigned long, void *)> driver; // answers requests; without it they fail
     bool calloc_fails = false;
     bool fprintf_fails = false;
     bool munmap_fails = false;
