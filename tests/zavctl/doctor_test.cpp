@@ -27,6 +27,7 @@ PlatformFacts sound() {
     facts.examined = "/dev/sata/disk1p1";
     facts.examine = exited(0, "ARRAY /dev/md/MD0 level=raid1 num-devices=4\n");
     facts.raidtype.text = "raidtype=5;0;4\n";
+    facts.controller_report.text = "PCI\nR:1:SET:1:4:1234:0\n";
     facts.nvram_bytes = 114;
     facts.sata_nodes = {"disk1", "disk1p1"};
     facts.swraid_nodes = {"disk1p1"};
@@ -86,6 +87,24 @@ TEST(Doctor, GroupsNeedAPlaceForTheirFiles) {
     PlatformFacts facts = sound();
     facts.volume_files_error = EROFS;
     EXPECT_EQ(verdict(facts, "volume-files"), Severity::critical);
+}
+
+TEST(Doctor, TheHardwareRaidModelNeedsTheControllersReport) {
+    PlatformFacts facts = sound();
+    facts.model.code = 0x300;
+    facts.controller_report.text = "PCI\nR:1:SET:1:4:1234:0\n";
+    EXPECT_EQ(verdict(facts, "raid-report"), Severity::ok);
+    facts.controller_report.text = "RBOD#1\n";
+    EXPECT_EQ(verdict(facts, "raid-report"), Severity::critical);
+    facts.controller_report = {ENOENT, ""};
+    EXPECT_EQ(verdict(facts, "raid-report"), Severity::critical);
+}
+
+TEST(Doctor, OtherModelsNeedNoControllersReport) {
+    PlatformFacts facts = sound();
+    facts.controller_report.error = ENOENT;
+    for (const Check &check : platform_checks(facts))
+        EXPECT_NE(check.name, "raid-report");
 }
 
 TEST(Doctor, SmartctlMustTellAMissingDevice) {

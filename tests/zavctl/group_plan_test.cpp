@@ -64,6 +64,15 @@ std::string complaint(const Words &words) {
 
 } // namespace
 
+TEST(GroupPlan, TheRaidControllersArraysAreLeftAlone) {
+    GroupFacts more = addition();
+    more.hardware_raid = true;
+    EXPECT_REFUSED(group_addition_plan(more), "are the RAID controller's");
+    GroupFacts less = removal();
+    less.hardware_raid = true;
+    EXPECT_REFUSED(group_removal_plan(less, false), "are the RAID controller's");
+}
+
 TEST(GroupAddition, TheGroupIsCreatedOrExtended) {
     EXPECT_EQ(words_of(group_addition_plan(addition())), (Words{"label", "create"}));
     const Plan extended = group_addition_plan(addition(ZAV_LVM_NORMAL));

@@ -36,6 +36,11 @@ TEST(RunUsage, UnknownWordsSuggestTheNearest) {
 TEST(RunUsage, MissingAndExtraArgumentsAreRefused) {
     expect_usage({"disk", "show"}, "N is required");
     expect_usage({"disk", "show", "x"}, "x");
+    expect_usage({"disk", "show", "0-1"}, "'0-1' is no disk");
+    expect_usage({"disk", "show", "/dev/sata/disk1p1"}, "'/dev/sata/disk1p1' is no disk");
+    expect_usage({"array", "show", "/dev/sata/disk1"}, "'/dev/sata/disk1' is no array");
+    expect_usage({"unit", "show", "8"}, "8");
+    expect_usage({"unit", "show"}, "N is required");
     expect_usage({"disk", "list", "more"}, "'more' is one word too many");
     expect_usage({"disk", "list", "--json", "--jsonl"}, "exclude each other");
     expect_usage({"disk", "list", "--timeout", "0"}, "--timeout");
@@ -73,6 +78,11 @@ TEST(RunUsage, EveryLevelHasItsHelp) {
                                                           {"disk", "add"},
                                                           {"array", "show"},
                                                           {"vg"},
+                                                          {"unit"},
+                                                          {"unit", "list"},
+                                                          {"unit", "show"},
+                                                          {"report"},
+                                                          {"report", "check"},
                                                           {"vg", "list"},
                                                           {"vg", "show"},
                                                           {"vg", "add"},

@@ -24,20 +24,6 @@ std::string why(int error) {
     return std::strerror(error);
 }
 
-std::string how_it_ended(const RunResult &run) {
-    switch (run.end) {
-    case RunResult::End::exited:
-        return fmt::format("exit status {}", run.status);
-    case RunResult::End::timed_out:
-        return "no answer in time";
-    case RunResult::End::signalled:
-        return fmt::format("ended by signal {}", run.status);
-    case RunResult::End::not_started:
-        break;
-    }
-    return "not started";
-}
-
 bool exited_with(const RunResult &run, int status) {
     return run.end == RunResult::End::exited && run.status == status;
 }
@@ -243,8 +229,30 @@ void check_volume_files(const PlatformFacts &facts, Checks &checks) {
     else
         checks.push_back({Severity::critical, "volume-files",
                           "/etc/Kiru/zav: " + why(facts.volume_files_error),
-                          "the queries of volume groups keep the tools' words there: every group "
-                          "reads as not existing"});
+                          facts.model.hardware_raid()
+                              ? "the list of expansion units is kept there: the units cannot be "
+                                "told, nor can volume groups"
+                              : "the queries of volume groups keep the tools' words there: every "
+                                "group reads as not existing"});
+}
+
+// Only that it is there: 'zavctl report check' reads it line by line.
+void check_controller_report(const PlatformFacts &facts, Checks &checks) {
+    constexpr const char *file = "/etc/Kiru/zav/.raidinfo";
+    if (!facts.model.hardware_raid())
+        return;
+    const FileFact &report = facts.controller_report;
+    if (report.error != 0)
+        checks.push_back({Severity::critical, "raid-report",
+                          fmt::format("{}: {}", file, why(report.error)),
+                          "the RAID controller's agent has not written it: no disk, no volume and "
+                          "no reading can be told"});
+    else if (report.text.find("PCI") == std::string::npos)
+        checks.push_back({Severity::critical, "raid-report",
+                          fmt::format("{} has no section of the controller", file),
+                          "the controller's disks read as absent, its volumes as not existing"});
+    else
+        checks.push_back(well("raid-report", fmt::format("{} is readable", file)));
 }
 
 void check_log(const PlatformFacts &facts, Checks &checks) {
@@ -271,6 +279,20 @@ void check_software_raid(const PlatformFacts &facts, Checks &checks) {
 }
 
 } // namespace
+
+std::string how_it_ended(const RunResult &run) {
+    switch (run.end) {
+    case RunResult::End::exited:
+        return fmt::format("exit status {}", run.status);
+    case RunResult::End::timed_out:
+        return "no answer in time";
+    case RunResult::End::signalled:
+        return fmt::format("ended by signal {}", run.status);
+    case RunResult::End::not_started:
+        break;
+    }
+    return "not started";
+}
 
 std::string shell_doubt(const RunResult &shell_false) {
     if (shell_false.end != RunResult::End::exited)
@@ -299,6 +321,7 @@ Checks platform_checks(const PlatformFacts &facts) {
     check_nvram(facts, checks);
     check_semaphores(facts, checks);
     check_volume_files(facts, checks);
+    check_controller_report(facts, checks);
     check_log(facts, checks);
     check_locale(facts, checks);
     return checks;

@@ -44,7 +44,8 @@ struct PlatformFacts {
     FileFact mdstat;
     FileFact scsi;
     FileFact raidtype;
-    int nvram_error = 0; // errno of reading, 0: read
+    FileFact controller_report; // of the RAID controller's agent
+    int nvram_error = 0;        // errno of reading, 0: read
     int nvram_bytes = 0;
     std::vector<std::string> sata_nodes;   // names in /dev/sata
     std::vector<std::string> swraid_nodes; // names in /dev/swraid
@@ -58,6 +59,9 @@ struct PlatformFacts {
     bool log_socket = false;
     int volume_files_error = 0; // errno of making a file where the queries of groups keep theirs
 };
+
+// "exit status 3", "no answer in time", "ended by signal 9", "not started".
+std::string how_it_ended(const RunResult &run);
 
 struct Check {
     Severity severity = Severity::ok;

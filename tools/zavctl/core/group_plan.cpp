@@ -25,6 +25,9 @@ PlanStep step(std::string does, std::string text, Severity severity) {
 }
 
 void refuse_unfit(const GroupFacts &facts, Plan &plan) {
+    if (facts.hardware_raid)
+        refuse(plan, "the disks and arrays of this model are the RAID controller's: volume groups "
+                     "are changed on models with software RAID alone");
     if (!facts.group.doubt.empty())
         refuse(plan, "the library's answers cannot be trusted here: " + facts.group.doubt);
     if (!facts.missing_tools.empty())

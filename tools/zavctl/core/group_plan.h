@@ -30,6 +30,7 @@ struct DeviceFact {
 };
 
 struct GroupFacts {
+    bool hardware_raid = false; // the model's arrays are the RAID controller's
     GroupReport group;
     std::vector<VolumeFact> volumes; // that the library names
     std::vector<DeviceFact> devices; // under its physical volumes, or the one to add

@@ -73,6 +73,7 @@ CheckedEnclosure checked_enclosure(const EnclosureTrace &trace) {
     enclosure.serial = trace.identity().sn;
     enclosure.report = trace.report();
     enclosure.remarks = trace.remarks_at_end();
+    enclosure.borrows_readings = trace.borrows_readings();
     return enclosure;
 }
 

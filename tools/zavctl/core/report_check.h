@@ -22,6 +22,7 @@ struct CheckedEnclosure {
     std::string serial;
     EnclosureReport report;
     std::vector<ReportRemark> remarks; // about the section as a whole
+    bool borrows_readings = false;     // of the next section that has some
 };
 
 struct ReportCheck {

@@ -217,7 +217,8 @@ void EnclosureTrace::take_reading(const std::string &piece) {
     monitor_.take(copy.data());
     if (!monitor_.line_found())
         return;
-    if (!is_own())
+    borrows_readings_ = !is_own();
+    if (borrows_readings_)
         say("this section has no monitor line: the next one's is read", Severity::warning);
     say("readings " + readings_text(report()));
     for (const int item : {0, 4})

@@ -54,6 +54,9 @@ class EnclosureTrace {
     const sRBODMap &identity() const { return identity_; }
     std::vector<ReportRemark> remarks_at_end() const;
 
+    // Its readings are those of another section, for want of own ones.
+    bool borrows_readings() const { return borrows_readings_; }
+
   private:
     using Kind = zav::EnclosureReader::Kind;
     using Piece = zav::EnclosureReader::Piece;
@@ -78,6 +81,7 @@ class EnclosureTrace {
     sRBODMap identity_ = {};
     bool identity_open_;
     bool has_set_ = false;
+    bool borrows_readings_ = false;
     std::vector<int> volumes_; // numbers of those taken
     LineContext context_;
     std::vector<ReportRemark> remarks_;

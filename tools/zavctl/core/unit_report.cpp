@@ -51,6 +51,10 @@ bool is_beyond(const UnitReport &unit) {
     return !unit.present && unit.number > last_unit;
 }
 
+bool cannot_be_told(const UnitReport &unit) {
+    return unit.failure || !unit.doubt.empty() || is_beyond(unit);
+}
+
 Finding sensor_finding(const UnitReport &unit, const SensorReport &sensor, const std::string &name,
                        const std::string &reading) {
     const Severity bad = severity(sensor);
@@ -143,15 +147,13 @@ std::string sensor_text(const SensorReport &sensor, const char *format) {
 }
 
 std::string unit_state_word(const UnitReport &unit) {
-    if (unit.failure || is_beyond(unit))
+    if (cannot_be_told(unit))
         return "unknown";
     return unit.present ? "present" : "missing";
 }
 
 Severity severity(const UnitReport &unit) {
-    if (unit.failure)
-        return Severity::unknown;
-    if (is_beyond(unit))
+    if (cannot_be_told(unit))
         return Severity::unknown;
     if (!unit.present)
         return Severity::critical;
@@ -161,6 +163,8 @@ Severity severity(const UnitReport &unit) {
 std::string unit_note(const UnitReport &unit) {
     if (unit.failure)
         return in_words(*unit.failure);
+    if (!unit.doubt.empty())
+        return unit.doubt;
     if (is_beyond(unit))
         return fmt::format("a link of unit {} leads to it, but the library takes {} units at most",
                            unit.linked_from, last_unit);
@@ -176,7 +180,7 @@ std::string unit_note(const UnitReport &unit) {
 
 std::vector<Finding> unit_findings(const UnitReport &unit) {
     const std::string number = fmt::format("{}", unit.number);
-    if (unit.failure || is_beyond(unit))
+    if (cannot_be_told(unit))
         return {finding_about(Severity::unknown, "unit", number, "gives no answer to trust",
                               "give no answer to trust")};
     if (!unit.present && !unit.asked_for)
@@ -195,8 +199,10 @@ std::vector<Finding> unit_findings(const UnitReport &unit) {
 }
 
 std::vector<Finding> cascade_findings(const CascadeReport &cascade) {
-    const char *what = cascade.units.empty() ? "the expansion units cannot be told: "
-                                             : "not all expansion units may be listed: ";
+    const bool some = std::any_of(cascade.units.begin(), cascade.units.end(),
+                                  [](const UnitReport &unit) { return unit.present; });
+    const char *what =
+        some ? "not all expansion units may be listed: " : "the expansion units cannot be told: ";
     if (cascade.failure)
         return {{Severity::unknown, what + in_words(*cascade.failure)}};
     if (!cascade.doubt.empty())
@@ -209,7 +215,7 @@ Json unit_json(const UnitReport &unit) {
     json["kind"] = "unit";
     json["unit"] = unit.number;
     json["state"] = unit_state_word(unit);
-    json["present"] = unit.failure ? Json(nullptr) : Json(unit.present);
+    json["present"] = cannot_be_told(unit) ? Json(nullptr) : Json(unit.present);
     json["model"] = text_or_null(unit.model);
     json["serial"] = text_or_null(unit.serial);
     json["sas_address"] = text_or_null(unit.sas_address);
@@ -221,6 +227,7 @@ Json unit_json(const UnitReport &unit) {
     add_enclosure(json, unit.enclosure);
     json["severity"] = word(severity(unit));
     json["note"] = unit_note(unit);
+    json["doubt"] = text_or_null(unit.doubt);
     json["error"] = to_json(unit.failure);
     return json;
 }

@@ -35,6 +35,7 @@ struct UnitReport {
     SensorReport voltage;
     EnclosureReport enclosure;
     std::optional<Failure> failure; // nothing is known of it
+    std::string doubt;              // why it is not known whether it is there, "" if it is
 };
 
 // All that hangs behind the controller.

@@ -66,7 +66,7 @@ GroupReport ask_group(Session &session, const Machine &machine, int number) {
 
 void add_array_state(Session &session, const Machine &machine, DeviceFact &fact) {
     const auto arrays = std::make_shared<std::vector<ArrayReport>>();
-    session.ask(ask_arrays(machine, {fact.address.device.disk}, session, arrays));
+    session.ask(ask_arrays(machine, std::vector{fact.address.device.disk}, session, arrays));
     const ArrayReport &array = arrays->front();
     fact.state = shown_state(array);
     fact.trouble = severity(array) == Severity::unknown ? array_note(array) : "";
@@ -76,7 +76,7 @@ void add_array_state(Session &session, const Machine &machine, DeviceFact &fact)
 void add_disk_state(Session &session, const Machine &machine, DeviceFact &fact) {
     const int slot = fact.address.device.disk;
     const auto disks = std::make_shared<std::vector<DiskReport>>();
-    session.ask(ask_disks(machine, {slot}, session, disks));
+    session.ask(ask_disks(machine, std::vector{slot}, session, disks));
     const DiskReport &disk = disks->front();
     fact.state = shown_state(disk);
     fact.trouble = severity(disk) == Severity::unknown ? disk_note(disk) : "";
@@ -110,6 +110,7 @@ DeviceFact device_fact(const Address &address) {
 GroupFacts addition_facts(Session &session, const Address &address, int group) {
     const Machine machine = read_machine();
     GroupFacts facts;
+    facts.hardware_raid = machine.model.hardware_raid();
     facts.group = ask_group(session, machine, group);
     facts.devices = {device_fact(address)};
     if (facts.devices.front().node_present)
@@ -122,6 +123,7 @@ GroupFacts addition_facts(Session &session, const Address &address, int group) {
 GroupFacts removal_facts_of(Session &session, int number) {
     const Machine machine = read_machine();
     GroupFacts facts;
+    facts.hardware_raid = machine.model.hardware_raid();
     facts.group = ask_group(session, machine, number);
     const auto volumes = std::make_shared<std::vector<VolumeReport>>();
     session.ask(ask_volumes(machine, volumes_of({facts.group}).ids, session, volumes));

@@ -1,6 +1,5 @@
+#include "asking.h"
 #include "volume_surveys.h"
-
-#include <fmt/format.h>
 
 namespace zavctl {
 
@@ -30,24 +29,11 @@ constexpr VerbHelp show_help = {
     "  zavctl lv show 0-1 /dev/DataVG1/LogVol2 --json",
 };
 
-std::vector<VolumeId> ids_of(const std::vector<std::string> &words) {
-    std::vector<VolumeId> ids;
-    for (const std::string &word : words) {
-        const std::optional<VolumeId> id = volume_id(word);
-        if (!id)
-            throw UsageError(fmt::format("'{}' is no logical volume. Volumes are named like 1-2 or "
-                                         "/dev/DataVG1/LogVol2",
-                                         printable(word)));
-        ids.push_back(*id);
-    }
-    return ids;
-}
-
 Answer list(Session &session) {
     const Machine machine = read_machine();
-    const auto groups = std::make_shared<std::vector<GroupReport>>();
+    const auto groups = no_reports<GroupReport>();
     session.ask(ask_groups(machine, listed_groups(machine), session, groups));
-    const auto volumes = std::make_shared<std::vector<VolumeReport>>();
+    const auto volumes = no_reports<VolumeReport>();
     const Named named = volumes_of(*groups);
     session.ask(ask_volumes(machine, named.ids, session, volumes));
     Section section = volume_list_section(*volumes, named.more);
@@ -55,8 +41,10 @@ Answer list(Session &session) {
     return {"lv list", "", {std::move(section)}};
 }
 
-Answer show(Session &session, const std::vector<VolumeId> &ids) {
-    const auto volumes = std::make_shared<std::vector<VolumeReport>>();
+Answer show(Session &session, const std::vector<std::string> &words) {
+    const auto ids = ids_of<VolumeId>(
+        words, volume_id, "no logical volume. Volumes are named like 1-2 or /dev/DataVG1/LogVol2");
+    const auto volumes = no_reports<VolumeReport>();
     session.ask(ask_volumes(read_machine(), ids, session, volumes));
     return {"lv show", "", {volume_show_section(*volumes)}};
 }
@@ -65,15 +53,9 @@ Answer show(Session &session, const std::vector<VolumeId> &ids) {
 
 void add_lv(CLI::App &root, Session &session) {
     CLI::App *lv = add_object(root, "lv", "The logical volumes: list, show");
-    add_verb(*lv, session, "list", list_help)->callback([&session] {
-        session.action = [&session] { return list(session); };
-    });
-    const auto words = std::make_shared<std::vector<std::string>>();
-    CLI::App *verb = add_verb(*lv, session, "show", show_help);
-    verb->add_option("VOLUME", *words, "GROUP-NUMBER, or the path of its device")->required();
-    verb->callback([&session, words] {
-        session.action = [&session, words] { return show(session, ids_of(*words)); };
-    });
+    add_list(*lv, session, list_help, list);
+    add_show<std::string>(*lv, session, show_help,
+                          {"VOLUME", "GROUP-NUMBER, or the path of its device"}, show);
 }
 
 } // namespace zavctl

@@ -41,6 +41,8 @@ void add_status(CLI::App &root, Session &session);
 void add_model(CLI::App &root, Session &session);
 void add_disk(CLI::App &root, Session &session);
 void add_array(CLI::App &root, Session &session);
+void add_unit(CLI::App &root, Session &session);
+void add_report(CLI::App &root, Session &session);
 void add_vg(CLI::App &root, Session &session);
 void add_pv(CLI::App &root, Session &session);
 void add_lv(CLI::App &root, Session &session);

@@ -1,6 +1,5 @@
+#include "asking.h"
 #include "volume_surveys.h"
-
-#include <fmt/format.h>
 
 namespace zavctl {
 
@@ -27,24 +26,16 @@ constexpr VerbHelp show_help = {
     "  zavctl pv show 0-1 1-1 --json",
 };
 
-std::vector<VolumeId> ids_of(const std::vector<std::string> &words) {
-    std::vector<VolumeId> ids;
-    for (const std::string &word : words) {
-        const std::optional<VolumeId> id = volume_id(word);
-        if (!id || word.starts_with("/"))
-            throw UsageError(fmt::format("'{}' is no physical volume. They are named like 1-1: "
-                                         "group, and number from 1",
-                                         printable(word)));
-        ids.push_back(*id);
-    }
-    return ids;
+// Physical volumes have no paths.
+std::optional<VolumeId> pv_id(const std::string &word) {
+    return word.starts_with("/") ? std::nullopt : volume_id(word);
 }
 
 Answer list(Session &session) {
     const Machine machine = read_machine();
-    const auto groups = std::make_shared<std::vector<GroupReport>>();
+    const auto groups = no_reports<GroupReport>();
     session.ask(ask_groups(machine, listed_groups(machine), session, groups));
-    const auto pvs = std::make_shared<std::vector<PvReport>>();
+    const auto pvs = no_reports<PvReport>();
     const Named named = pvs_of(*groups);
     session.ask(ask_pvs(machine, named.ids, session, pvs));
     Section section = pv_list_section(*pvs, named.more);
@@ -52,8 +43,10 @@ Answer list(Session &session) {
     return {"pv list", "", {std::move(section)}};
 }
 
-Answer show(Session &session, const std::vector<VolumeId> &ids) {
-    const auto pvs = std::make_shared<std::vector<PvReport>>();
+Answer show(Session &session, const std::vector<std::string> &words) {
+    const auto ids = ids_of<VolumeId>(
+        words, pv_id, "no physical volume. They are named like 1-1: group, and number from 1");
+    const auto pvs = no_reports<PvReport>();
     session.ask(ask_pvs(read_machine(), ids, session, pvs));
     return {"pv show", "", {pv_show_section(*pvs)}};
 }
@@ -62,15 +55,8 @@ Answer show(Session &session, const std::vector<VolumeId> &ids) {
 
 void add_pv(CLI::App &root, Session &session) {
     CLI::App *pv = add_object(root, "pv", "The physical volumes: list, show");
-    add_verb(*pv, session, "list", list_help)->callback([&session] {
-        session.action = [&session] { return list(session); };
-    });
-    const auto words = std::make_shared<std::vector<std::string>>();
-    CLI::App *verb = add_verb(*pv, session, "show", show_help);
-    verb->add_option("VOLUME", *words, "GROUP-NUMBER")->required();
-    verb->callback([&session, words] {
-        session.action = [&session, words] { return show(session, ids_of(*words)); };
-    });
+    add_list(*pv, session, list_help, list);
+    add_show<std::string>(*pv, session, show_help, {"VOLUME", "GROUP-NUMBER"}, show);
 }
 
 } // namespace zavctl

@@ -1,5 +1,8 @@
+#include "asking.h"
 #include "surveys.h"
 #include "volume_surveys.h"
+
+#include "../core/unit_tree.h"
 
 #include <iterator>
 
@@ -9,7 +12,8 @@ namespace {
 
 constexpr VerbHelp help = {
     "The whole appliance on one screen",
-    "Shown: the model; the disks; the arrays with level, members and state, a progress bar\n"
+    "Shown: the model; on the hardware-RAID model the expansion units; the disks; the arrays with "
+    "level, members and state, a progress bar\n"
     "while one rebuilds; the volume groups with what they lie on; the logical volumes with usage\n"
     "and mount point; and one line that sums it up. The words for the states are explained by\n"
     "'zavctl disk list --help' and so on. Rows begin with a mark: ! warning, ? could not tell,\n"
@@ -22,27 +26,45 @@ constexpr VerbHelp help = {
 };
 
 struct Asked {
-    Shared<DiskReport> disks = std::make_shared<std::vector<DiskReport>>();
-    Shared<ArrayReport> arrays = std::make_shared<std::vector<ArrayReport>>();
-    Shared<GroupReport> groups = std::make_shared<std::vector<GroupReport>>();
-    Shared<VolumeReport> volumes = std::make_shared<std::vector<VolumeReport>>();
-    Shared<PvReport> pvs = std::make_shared<std::vector<PvReport>>();
+    SharedCascade cascade;
+    Shared<DiskReport> disks = no_reports<DiskReport>();
+    Shared<ArrayReport> arrays = no_reports<ArrayReport>();
+    Shared<GroupReport> groups = no_reports<GroupReport>();
+    Shared<VolumeReport> volumes = no_reports<VolumeReport>();
+    Shared<PvReport> pvs = no_reports<PvReport>();
 };
 
+// A survey of disks or arrays. Behind a RAID controller it is not known what to ask before the
+// cascade has answered.
+Survey survey_of(const Machine &machine, std::function<std::vector<Question>()> ask,
+                 std::function<Section()> report) {
+    if (machine.model.hardware_raid())
+        return {{}, std::move(report), std::move(ask)};
+    return {ask(), std::move(report)};
+}
+
 Survey disks_survey(const Machine &machine, const Session &session, const Asked &asked) {
-    return {ask_disks(machine, listed_slots(machine, false), session, asked.disks), [asked] {
-                Section section = disk_list_section(*asked.disks);
-                section.title = "Disks";
-                return section;
-            }};
+    const auto ask = [&machine, &session, asked] {
+        return ask_disks(machine, listed_disks(machine, *asked.cascade, false), session,
+                         asked.disks);
+    };
+    return survey_of(machine, ask, [asked] {
+        Section section = disk_list_section(*asked.disks);
+        section.title = "Disks";
+        return section;
+    });
 }
 
 Survey arrays_survey(const Machine &machine, const Session &session, const Asked &asked) {
-    return {ask_arrays(machine, listed_arrays(machine, false), session, asked.arrays), [asked] {
-                Section section = array_list_section(*asked.arrays, *asked.disks);
-                section.title = "Arrays";
-                return section;
-            }};
+    const auto ask = [&machine, &session, asked] {
+        return ask_arrays(machine, listed_arrays(machine, *asked.cascade, false), session,
+                          asked.arrays);
+    };
+    return survey_of(machine, ask, [asked] {
+        Section section = array_list_section(*asked.arrays, *asked.disks);
+        section.title = "Arrays";
+        return section;
+    });
 }
 
 // A table without rows is no section of the screen; its records are.
@@ -54,6 +76,14 @@ Section titled(Section section, const char *title) {
         section.title = title;
     }
     return section;
+}
+
+Survey units_survey(const Machine &machine, const Session &session, const Asked &asked) {
+    if (!machine.model.hardware_raid())
+        return {{}, [] { return Section(); }};
+    return {ask_cascade(machine, asked.cascade),
+            [asked] { return titled(unit_list_section(*asked.cascade), "Expansion units"); },
+            [&session, asked] { return ask_sensors(session, asked.cascade); }};
 }
 
 Survey groups_survey(const Machine &machine, const Session &session, const Asked &asked) {
@@ -85,8 +115,8 @@ Survey pvs_survey(const Machine &machine, const Session &session, const Asked &a
 
 // The sections below the heading, from top to bottom.
 using MakeSurvey = Survey (*)(const Machine &, const Session &, const Asked &);
-constexpr MakeSurvey parts[] = {disks_survey, arrays_survey, groups_survey, pvs_survey,
-                                volumes_survey};
+constexpr MakeSurvey parts[] = {units_survey,  disks_survey, arrays_survey,
+                                groups_survey, pvs_survey,   volumes_survey};
 
 // The model stands in the heading; its section adds its record and its findings.
 Section model_part(const Machine &machine) {
@@ -97,7 +127,7 @@ Section model_part(const Machine &machine) {
 }
 
 std::vector<Survey> surveys_of(const Machine &machine, const Session &session) {
-    const Asked asked;
+    const Asked asked{begin_cascade(machine, session)};
     std::vector<Survey> surveys;
     if (machine.model.known())
         for (const MakeSurvey part : parts)

@@ -1,7 +1,6 @@
+#include "asking.h"
 #include "group_verbs.h"
 #include "volume_surveys.h"
-
-#include <fmt/format.h>
 
 namespace zavctl {
 
@@ -33,7 +32,7 @@ constexpr VerbHelp show_help = {
 
 Answer group_answer(Session &session, const Machine &machine, const std::vector<int> &numbers,
                     const char *command) {
-    const auto reports = std::make_shared<std::vector<GroupReport>>();
+    const auto reports = no_reports<GroupReport>();
     session.ask(ask_groups(machine, numbers, session, reports));
     const bool list = std::string(command) == "vg list";
     return {command, "", {list ? group_list_section(*reports) : group_show_section(*reports)}};
@@ -43,22 +42,15 @@ Answer group_answer(Session &session, const Machine &machine, const std::vector<
 
 void add_vg(CLI::App &root, Session &session) {
     CLI::App *vg = add_object(root, "vg", "The volume groups: list, show, add, remove");
-    add_verb(*vg, session, "list", list_help)->callback([&session] {
-        session.action = [&session] {
-            const Machine machine = read_machine();
-            return group_answer(session, machine, listed_groups(machine), "vg list");
-        };
+    add_list(*vg, session, list_help, [](Session &asking) {
+        const Machine machine = read_machine();
+        return group_answer(asking, machine, listed_groups(machine), "vg list");
     });
-    const auto numbers = std::make_shared<std::vector<int>>();
-    CLI::App *show = add_verb(*vg, session, "show", show_help);
-    show->add_option("N", *numbers, "Number of the group, 0 is PrimaryOSVG")
-        ->required()
+    add_show<int>(*vg, session, show_help, {"N", "Number of the group, 0 is PrimaryOSVG"},
+                  [](Session &asking, const std::vector<int> &numbers) {
+                      return group_answer(asking, read_machine(), numbers, "vg show");
+                  })
         ->check(CLI::NonNegativeNumber);
-    show->callback([&session, numbers] {
-        session.action = [&session, numbers] {
-            return group_answer(session, read_machine(), *numbers, "vg show");
-        };
-    });
     add_vg_add(*vg, session);
     add_vg_remove(*vg, session);
 }

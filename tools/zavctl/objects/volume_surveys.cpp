@@ -1,5 +1,7 @@
 #include "volume_surveys.h"
 
+#include "asking.h"
+
 #include "../system/files.h"
 #include "../system/library.h"
 #include "../system/run.h"
@@ -113,19 +115,6 @@ PvReport answered(PvReport pv, const std::string &tool_missing) {
     return pv;
 }
 
-// A question per report, which replaces it with the answer.
-template <class Report>
-Question question(const std::string &about, const Machine &machine, const Report &begin,
-                  const Shared<Report> &reports) {
-    const std::size_t index = reports->size();
-    reports->push_back(begin);
-    return {about, [begin, index, reports, missing = machine.volume_tool_missing] {
-                return [report = answered(begin, missing), index, reports] {
-                    (*reports)[index] = report;
-                };
-            }};
-}
-
 Named named(const std::vector<GroupReport> &groups, std::vector<int> GroupReport::*numbers,
             int GroupReport::*count) {
     Named result;
@@ -140,13 +129,14 @@ Named named(const std::vector<GroupReport> &groups, std::vector<int> GroupReport
     return result;
 }
 
-template <class Id, class MakeQuestion>
-std::vector<Question> questions_of(const std::vector<Id> &ids, const MakeQuestion &make) {
-    std::vector<Question> questions;
-    questions.reserve(ids.size());
-    for (const Id &id : ids)
-        questions.push_back(make(id));
-    return questions;
+// A question that knows which tool is missing.
+template <class Report>
+Question asked_of_tools(const std::string &about, const Machine &machine, const Report &begin,
+                        const Shared<Report> &reports) {
+    return question(about, begin, reports,
+                    [missing = machine.volume_tool_missing](const Report &report) {
+                        return answered(report, missing);
+                    });
 }
 
 bool has_arrays(const Machine &machine) {
@@ -171,24 +161,24 @@ std::vector<int> listed_groups(const Machine &machine) {
 std::vector<Question> ask_groups(const Machine &machine, const std::vector<int> &numbers,
                                  const Session &session, const Shared<GroupReport> &reports) {
     return questions_of(numbers, [&](int number) {
-        return question("group " + group_name(number), machine,
-                        unanswered_group(machine, number, session), reports);
+        return asked_of_tools("group " + group_name(number), machine,
+                              unanswered_group(machine, number, session), reports);
     });
 }
 
 std::vector<Question> ask_volumes(const Machine &machine, const std::vector<VolumeId> &ids,
                                   const Session &session, const Shared<VolumeReport> &reports) {
     return questions_of(ids, [&](const VolumeId &id) {
-        return question("volume " + in_words(id), machine, unanswered_volume(machine, id, session),
-                        reports);
+        return asked_of_tools("volume " + in_words(id), machine,
+                              unanswered_volume(machine, id, session), reports);
     });
 }
 
 std::vector<Question> ask_pvs(const Machine &machine, const std::vector<VolumeId> &ids,
                               const Session &session, const Shared<PvReport> &reports) {
     return questions_of(ids, [&](const VolumeId &id) {
-        return question("physical volume " + in_words(id), machine,
-                        unanswered_pv(machine, id, session), reports);
+        return asked_of_tools("physical volume " + in_words(id), machine,
+                              unanswered_pv(machine, id, session), reports);
     });
 }
 

@@ -12,23 +12,22 @@
 
 namespace zavctl {
 
-namespace {
-
-constexpr std::size_t size_limit = 1U << 20U;
-
-} // namespace
-
-FileFact read_file(const std::string &path) {
+FileFact read_descriptor(int descriptor) {
     FileFact file;
-    const int descriptor = open(path.c_str(), O_RDONLY | O_CLOEXEC);
-    if (descriptor < 0)
-        return {errno, ""};
     std::array<char, 4096> piece{};
     ssize_t got = 0;
-    while (file.text.size() < size_limit &&
+    while (file.text.size() < largest_file &&
            (got = read(descriptor, piece.data(), piece.size())) > 0)
         file.text.append(piece.data(), static_cast<std::size_t>(got));
     file.error = got < 0 ? errno : 0;
+    return file;
+}
+
+FileFact read_file(const std::string &path) {
+    const int descriptor = open(path.c_str(), O_RDONLY | O_CLOEXEC);
+    if (descriptor < 0)
+        return {errno, ""};
+    FileFact file = read_descriptor(descriptor);
     close(descriptor);
     return file;
 }

@@ -3,13 +3,17 @@
 
 #include "../core/doctor.h"
 
+#include <cstddef>
 #include <string>
 #include <vector>
 
 namespace zavctl {
 
-// At most a megabyte of a file.
+constexpr std::size_t largest_file = 1U << 20U;
+
+// At most that much of a file.
 FileFact read_file(const std::string &path);
+FileFact read_descriptor(int descriptor);
 
 // The names in a directory, sorted; empty if it cannot be read (then `error` says why).
 std::vector<std::string> names_in(const std::string &directory, int &error);

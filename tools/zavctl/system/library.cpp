@@ -26,6 +26,7 @@ constexpr CodeMeaning meanings[] = {
     {ZAV_RC_ERR, "a step failed"},
     {0x1001, "the saved file came out too short"},
     {0x1301, "no known model"},
+    {ZAV_RC_ERR_READINFOFAIL, "the RAID controller's report cannot be read"},
     {0x2801, "the mount point cannot be measured"},
 };
 
@@ -102,6 +103,41 @@ RaidAnswer raid_state(const zavDevice &device) {
     RaidAnswer answer;
     zavDevice copy = device;
     answer.result = zavGetStateRaid(&copy, &answer.state);
+    return answer;
+}
+
+SetAnswer raid_set(const zavDevice &device) {
+    SetAnswer answer;
+    zavDevice copy = device;
+    answer.result = updateData(&copy, &answer.set);
+    return answer;
+}
+
+UnitsAnswer expansion_units() {
+    UnitsAnswer answer;
+    answer.result = zavGetRBODSet(&answer.units);
+    return answer;
+}
+
+UnitAnswer unit_state(int unit, int sensor) {
+    UnitAnswer answer;
+    sRBOD asked{};
+    asked.id = unit;
+    answer.result = zavGetStateRBOD(&asked, sensor, &answer.state);
+    return answer;
+}
+
+ReadingAnswer unit_reading(int unit, int item) {
+    ReadingAnswer answer;
+    float value = 0;
+    answer.result = zavGetRBODHwMon(unit, item, &value);
+    answer.value = static_cast<double>(value);
+    return answer;
+}
+
+ReadingAnswer card_reading(int item) {
+    ReadingAnswer answer;
+    answer.result = zavGetRaidCardHwMon(item, &answer.value);
     return answer;
 }
 

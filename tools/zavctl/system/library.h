@@ -38,6 +38,27 @@ struct VolumeAnswer {
     zavLVMState state{};
 };
 
+// What the RAID controller's report says of an enclosure.
+struct SetAnswer {
+    int result = 0;
+    sRaidSetInfo set{};
+};
+
+struct UnitsAnswer {
+    int result = 0;
+    sRBODSet units{};
+};
+
+struct UnitAnswer {
+    int result = 0;
+    zavRBODState state{};
+};
+
+struct ReadingAnswer {
+    int result = 0;
+    double value = 0;
+};
+
 ModelConfig model_config();
 int data_raid_type();
 std::optional<std::string> product_name();
@@ -49,6 +70,13 @@ int name_result(const zavDevice &device);    // what the library says to the con
 
 DiskAnswer disk_state(const zavDevice &device);
 RaidAnswer raid_state(const zavDevice &device);
+
+// Of the enclosure that holds the device.
+SetAnswer raid_set(const zavDevice &device);
+UnitsAnswer expansion_units();
+UnitAnswer unit_state(int unit, int sensor);
+ReadingAnswer unit_reading(int unit, int item);
+ReadingAnswer card_reading(int item);
 
 // Of a group, a logical or a physical volume: see the record's `dev`.
 VolumeAnswer volume_state(const zavDevice &device);

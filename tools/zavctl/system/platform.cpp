@@ -34,9 +34,13 @@ struct Tool {
     const char *name;
     const char *purpose;
     const char *without;
-    bool software_raid; // not needed on the hardware-RAID model
+    enum class For { all, software_raid, hardware_raid } models;
     Severity missing;
 };
+
+constexpr auto all_models = Tool::For::all;
+constexpr auto software_raid = Tool::For::software_raid;
+constexpr auto hardware_raid_only = Tool::For::hardware_raid;
 
 constexpr const char *no_volumes = "no volume group and no volume can be told";
 constexpr const char *no_devices = "what groups lie on cannot be told, and no disk is added";
@@ -45,31 +49,34 @@ constexpr const char *no_setup = "the volumes of a data array that is created an
 
 // A function that needs another tool adds it here.
 constexpr Tool tools[] = {
-    {"smartctl", "the health of disks", "every disk that is there reads as failed", true,
+    {"smartctl", "the health of disks", "every disk that is there reads as failed", software_raid,
      Severity::critical},
-    {"/sbin/mdadm", "the state of arrays", "the state of no array can be told", true,
+    {"/sbin/mdadm", "the state of arrays", "the state of no array can be told", software_raid,
      Severity::critical},
-    {"cat", "counting disks", "no disk is counted", false, Severity::critical},
-    {"grep", "counting disks", "no disk is counted", false, Severity::critical},
-    {"wc", "counting disks", "no disk is counted", false, Severity::critical},
-    {"/usr/sbin/vgs", "volume groups", no_volumes, false, Severity::critical},
-    {"/usr/sbin/lvs", "logical volumes", no_volumes, false, Severity::critical},
-    {"/usr/sbin/pvs", "physical volumes", no_volumes, false, Severity::critical},
-    {"/usr/sbin/vgdisplay", "volume groups", no_volumes, false, Severity::critical},
-    {"/usr/sbin/lvdisplay", "logical volumes", no_volumes, false, Severity::critical},
-    {"/usr/sbin/pvdisplay", "physical volumes", no_volumes, false, Severity::critical},
-    {"/usr/sbin/vgcfgbackup", "what groups consist of", "no volume group can be told", false,
+    {"cat", "counting disks", "no disk is counted", all_models, Severity::critical},
+    {"grep", "counting disks", "no disk is counted", all_models, Severity::critical},
+    {"wc", "counting disks", "no disk is counted", all_models, Severity::critical},
+    {"/usr/sbin/vgs", "volume groups", no_volumes, all_models, Severity::critical},
+    {"/usr/sbin/lvs", "logical volumes", no_volumes, all_models, Severity::critical},
+    {"/usr/sbin/pvs", "physical volumes", no_volumes, all_models, Severity::critical},
+    {"/usr/sbin/vgdisplay", "volume groups", no_volumes, all_models, Severity::critical},
+    {"/usr/sbin/lvdisplay", "logical volumes", no_volumes, all_models, Severity::critical},
+    {"/usr/sbin/pvdisplay", "physical volumes", no_volumes, all_models, Severity::critical},
+    {"/usr/sbin/vgcfgbackup", "what groups consist of", "no volume group can be told", all_models,
      Severity::critical},
-    {"udevinfo", "the addresses of devices", no_devices, false, Severity::warning},
-    {"/sbin/sfdisk", "adding a disk", no_addition, true, Severity::warning},
-    {"/bin/dd", "adding a disk", no_addition, true, Severity::warning},
-    {"/usr/bin/hbqSetup.sh", "setting up volumes", no_setup, true, Severity::warning},
+    {"/usr/bin/query_sas.sh", "the cascade of expansion units",
+     "every expansion unit reads as not there", hardware_raid_only, Severity::critical},
+    {"udevinfo", "the addresses of devices", no_devices, all_models, Severity::warning},
+    {"/sbin/sfdisk", "adding a disk", no_addition, software_raid, Severity::warning},
+    {"/bin/dd", "adding a disk", no_addition, software_raid, Severity::warning},
+    {"/usr/bin/hbqSetup.sh", "setting up volumes", no_setup, software_raid, Severity::warning},
 };
 
 std::vector<ToolFact> read_tools(bool hardware_raid) {
+    const Tool::For not_needed = hardware_raid ? software_raid : hardware_raid_only;
     std::vector<ToolFact> facts;
     for (const Tool &tool : tools)
-        if (!tool.software_raid || !hardware_raid)
+        if (tool.models != not_needed)
             facts.push_back(
                 {tool.name, find_tool(tool.name), tool.purpose, tool.without, tool.missing});
     return facts;
@@ -199,6 +206,7 @@ PlatformFacts read_platform(const ModelReport &model) {
     facts.mdstat = read_file("/proc/mdstat");
     facts.scsi = read_file("/proc/scsi/scsi");
     facts.raidtype = read_file("/etc/Kiru/raidtype");
+    facts.controller_report = read_file("/etc/Kiru/zav/.raidinfo");
     facts.sata_nodes = names_in("/dev/sata", error);
     facts.swraid_nodes = names_in("/dev/swraid", error);
     facts.examined = first_partition(facts.sata_nodes);

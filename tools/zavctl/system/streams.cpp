@@ -1,5 +1,7 @@
 #include "streams.h"
 
+#include "files.h"
+
 #include <sys/ioctl.h>
 
 #include <cerrno>
@@ -108,6 +110,10 @@ bool Streams::confirm(const std::string &question) const {
         line += c;
     line = trimmed(line);
     return line == "y" || line == "Y" || line == "yes" || line == "Yes";
+}
+
+FileFact Streams::read_input() const {
+    return read_descriptor(in_);
 }
 
 bool Streams::can_ask() const {

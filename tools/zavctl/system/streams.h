@@ -1,6 +1,7 @@
 // zavctl's own input and output, kept apart from what the library and its tools print and read.
 #pragma once
 
+#include "../core/doctor.h"
 #include "../core/text.h"
 
 #include <string>
@@ -22,6 +23,9 @@ class Streams {
 
     // Asks on standard error, reads a line from the real standard input: true for y or yes.
     bool confirm(const std::string &question) const;
+
+    // The real standard input, as far as a file is read.
+    FileFact read_input() const;
 
     // The real standard error, whatever descriptor 2 has become meanwhile.
     int err() const { return err_; }
