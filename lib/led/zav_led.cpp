@@ -69,10 +69,8 @@ const char *panel_line(int led) {
 }
 
 const char *const *disk_lines(int led) {
-    const int index = led - kFirstDiskLed;
-    return led < kFirstDiskLed || index >= static_cast<int>(std::size(kDiskLines))
-               ? nullptr
-               : kDiskLines[index];
+    const int after_last = kFirstDiskLed + static_cast<int>(std::size(kDiskLines));
+    return led < kFirstDiskLed || led >= after_last ? nullptr : kDiskLines[led - kFirstDiskLed];
 }
 
 // The disks' LEDs belong to the RAID controller where there is one.
