@@ -162,7 +162,8 @@ TEST(ReportCheck, ReadingsOfZeroAreNoAnswer) {
 }
 
 TEST(ReportCheck, ASecondSectionOfAnEnclosureIsIgnored) {
-    EXPECT_TRUE(holds(screen(own + own), " !         the controller: a second section: ignored"))
+    EXPECT_TRUE(
+        holds(screen(own + own), " !        -> the controller: a second section: ignored\n"))
         << screen(own + own);
 }
 
@@ -175,6 +176,16 @@ TEST(ReportCheck, ControlCharactersAreShownHarmlessly) {
     const std::string text = own + "\033[31m\x80\n";
     EXPECT_TRUE(holds(screen(text), "\\x1b[31m\\x80")) << screen(text);
     EXPECT_EQ(to_json(answer(text)).find('\033'), std::string::npos);
+}
+
+TEST(ReportCheck, RemarksStayBelowTheirLineOnANarrowScreen) {
+    Style narrow;
+    narrow.width = 40;
+    EXPECT_TRUE(holds(to_text(answer(own), narrow), "    5     R:1:MAINSET:2000.4:4:1234:0\n"
+                                                    "          -> the controller: RAID set 1\n"
+                                                    "          \"MAINSET\" 2000.4, 4 disks\n"
+                                                    "          (1234)\n"))
+        << to_text(answer(own), narrow);
 }
 
 TEST(ReportCheck, GarbageHasManyOddLinesAndAShortSummary) {

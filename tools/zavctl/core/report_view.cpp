@@ -9,6 +9,8 @@ namespace zavctl {
 
 namespace {
 
+constexpr std::size_t no_state = 2; // the table has no column of states
+
 Json remark_json(const ReportRemark &remark) {
     Json json;
     json["unit"] = remark.unit ? Json(*remark.unit) : Json(nullptr);
@@ -30,10 +32,9 @@ std::string text_of(const ReportRemark &remark) {
 }
 
 void add_lines(const CheckedLine &line, Section &section) {
-    section.lines.push_back(fmt::format("    {:>4}  {}", line.number, printable(line.text)));
+    section.table.add(Severity::ok, {fmt::format("{}", line.number), printable(line.text)});
     for (const ReportRemark &remark : line.remarks)
-        section.lines.push_back(
-            fmt::format(" {}         {}", mark(remark.severity), text_of(remark)));
+        section.table.add(remark.severity, {"", "-> " + text_of(remark)});
     Json json;
     json["kind"] = "report_line";
     json["line"] = line.number;
@@ -57,8 +58,11 @@ Section head_section(const ReportCheck &check) {
 
 Section lines_section(const ReportCheck &check) {
     Section section;
-    section.title = check.lines.empty() ? "" : "What is read";
     section.key = "lines";
+    if (check.lines.empty())
+        return section;
+    section.title = "What is read";
+    section.table = Table({"LINE", "TEXT, AND WHAT IS TAKEN FROM IT"}, no_state);
     for (const CheckedLine &line : check.lines)
         add_lines(line, section);
     return section;
