@@ -1,6 +1,7 @@
 #!/usr/bin/env bash
-# A simulated appliance loses a disk and gets another, and a volume group comes and goes, all with
-# zavctl. Ends with status 0 if every step came out as announced.
+# A simulated appliance loses a disk and gets another, and a volume group comes and goes; on another,
+# a unit of its cascade runs hot and loses a disk. All with zavctl. Ends with status 0 if every step
+# came out as announced.
 # usage: sim/demo.sh BUILD-DIRECTORY
 set -euo pipefail
 
@@ -8,8 +9,14 @@ scale=20 # appliance seconds in a second
 
 if [ $# -eq 1 ]; then
     build=$(cd "$1" && pwd)
-    exec "$build/zavsim" --model 2860-4 --time-scale $scale -- \
-        bash "$(realpath "${BASH_SOURCE[0]}")" "$build" inside
+    # play SCENE ZAVSIM-OPTION...
+    play() {
+        "$build/zavsim" --time-scale $scale "${@:2}" -- \
+            bash "$(realpath "${BASH_SOURCE[0]}")" "$build" "$1"
+    }
+    play disks --model 2860-4
+    play units --model 2980 --units 5
+    exit
 fi
 PATH=$1:$PATH
 
@@ -36,49 +43,70 @@ show() {
     pause 2
 }
 
-tell "A storage appliance: four disks, three arrays, two volume groups. All is well: exit status 0."
-show 0 zavctl status
+disks_scene() {
+    tell "A storage appliance: four disks, three arrays, two volume groups. All is well: exit status 0."
+    show 0 zavctl status
 
-tell "Disk 3 begins to die, and the kernel takes it out of its arrays: exit status 2."
-zavsim act disk 3 fails
-show 2 zavctl disk show 3
-show 1 zavctl array list
+    tell "Disk 3 begins to die, and the kernel takes it out of its arrays: exit status 2."
+    zavsim act disk 3 fails
+    show 2 zavctl disk show 3
+    show 1 zavctl array list
 
-tell "What would its removal do? Another disk would be a mistake, and is refused."
-show 0 zavctl disk remove 3 --dry-run
-show 2 zavctl disk remove 2 --dry-run
+    tell "What would its removal do? Another disk would be a mistake, and is refused."
+    show 0 zavctl disk remove 3 --dry-run
+    show 2 zavctl disk remove 2 --dry-run
 
-tell "It is taken out of service. What is seen meanwhile is told."
-show 0 zavctl disk remove 3 --yes
+    tell "It is taken out of service. What is seen meanwhile is told."
+    show 0 zavctl disk remove 3 --yes
 
-tell "It is pulled out, and an empty disk is put in."
-zavsim act disk 3 vanishes
-zavsim act disk 3 appears
-show 0 zavctl disk add 3 --yes
+    tell "It is pulled out, and an empty disk is put in."
+    zavsim act disk 3 vanishes
+    zavsim act disk 3 appears
+    show 0 zavctl disk add 3 --yes
 
-tell "The arrays are rebuilt one after the other, while the volumes stay in use."
-rounds=0
-until zavctl array list >/dev/null; do
-    printf '\n%s$ zavctl array list%s\n' "$bold" "$plain"
-    zavctl array list || true
-    rounds=$((rounds + 1))
-    [ "$rounds" -le 20 ] || fail 'the rebuild does not end'
-    pause 4
-done
-show 0 zavctl array list
+    tell "The arrays are rebuilt one after the other, while the volumes stay in use."
+    rounds=0
+    until zavctl array list >/dev/null; do
+        printf '\n%s$ zavctl array list%s\n' "$bold" "$plain"
+        zavctl array list || true
+        rounds=$((rounds + 1))
+        [ "$rounds" -le 20 ] || fail 'the rebuild does not end'
+        pause 4
+    done
+    show 0 zavctl array list
 
-tell "Array 3 is free: a volume group is made on it, and dismantled again."
-show 0 zavctl vg add array 3 --group 2 --yes
-show 0 zavctl vg list
-show 0 zavctl vg remove 2 --yes
+    tell "Array 3 is free: a volume group is made on it, and dismantled again."
+    show 0 zavctl vg add array 3 --group 2 --yes
+    show 0 zavctl vg list
+    show 0 zavctl vg remove 2 --yes
 
-tell "It extends the group of the data array instead."
-show 0 zavctl vg add array 3 --group 1 --yes
-show 0 zavctl pv list
+    tell "It extends the group of the data array instead."
+    show 0 zavctl vg add array 3 --group 1 --yes
+    show 0 zavctl pv list
 
-tell "A group that is dismantled takes its volumes with it, so every one is named before."
-show 0 zavctl vg remove 1 --dry-run
-show 0 zavctl vg remove 1 --yes
+    tell "A group that is dismantled takes its volumes with it, so every one is named before."
+    show 0 zavctl vg remove 1 --dry-run
+    show 0 zavctl vg remove 1 --yes
 
-tell "The data group is missing now, and that is a warning: exit status 1."
-show 1 zavctl status
+    tell "The data group is missing now, and that is a warning: exit status 1."
+    show 1 zavctl status
+}
+
+units_scene() {
+    tell "Another appliance: a RAID controller with five expansion units behind it."
+    show 0 zavctl unit list
+
+    tell "Unit 3 runs hot, and unit 2 loses a disk."
+    zavsim act unit 3 temperature 88
+    zavsim act unit 2 disk 4 vanishes
+    show 2 zavctl unit list
+    show 2 zavctl disk show 2-4
+    show 1 zavctl array show 2-1
+
+    tell "The unit is cooled, a new disk is put in; its controller rebuilds by itself."
+    zavsim act unit 3 temperature 45
+    zavsim act unit 2 disk 4 appears
+    show 1 zavctl array show 2-1
+}
+
+"$2_scene"
