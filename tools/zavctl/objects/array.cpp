@@ -225,6 +225,7 @@ std::vector<Question> ask_arrays(const Machine &machine, const std::vector<zavDe
 std::vector<Question> ask_arrays(const Machine &machine, const std::vector<int> &numbers,
                                  const Session &session, const Shared<ArrayReport> &reports) {
     std::vector<zavDevice> arrays;
+    arrays.reserve(numbers.size());
     for (const int number : numbers)
         arrays.push_back(own_array(machine, number));
     return ask_arrays(machine, arrays, session, reports);

@@ -154,8 +154,9 @@ std::vector<Question> ask_cascade(const Machine &machine, const SharedCascade &c
 
 std::vector<Question> ask_sensors(const Session &session, const SharedCascade &cascade) {
     std::vector<Question> questions;
-    for (std::size_t index = 0; index < cascade->units.size(); ++index) {
-        UnitReport &unit = cascade->units[index];
+    std::size_t next = 0;
+    for (UnitReport &unit : cascade->units) {
+        const std::size_t index = next++;
         if (!unit.present)
             continue;
         unit.temperature.failure = unit.voltage.failure = no_answer(session);

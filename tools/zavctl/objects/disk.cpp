@@ -152,6 +152,7 @@ std::vector<Question> ask_disks(const Machine &machine, const std::vector<zavDev
 std::vector<Question> ask_disks(const Machine &machine, const std::vector<int> &slots,
                                 const Session &session, const Shared<DiskReport> &reports) {
     std::vector<zavDevice> disks;
+    disks.reserve(slots.size());
     for (const int slot : slots)
         disks.push_back(own_disk(machine, slot));
     return ask_disks(machine, disks, session, reports);

@@ -85,6 +85,7 @@ Answer show(Session &session, const std::vector<int> &numbers) {
         return unknown_model("unit show", machine);
     const SharedCascade cascade = asked_cascade(session, machine);
     std::vector<UnitReport> wanted;
+    wanted.reserve(numbers.size());
     for (const int number : numbers)
         wanted.push_back(unit_asked_for(*cascade, number));
     cascade->units = std::move(wanted);
