@@ -477,6 +477,12 @@ TEST(UnitIdentity, StaysAsItWasWhereNothingIsTold) {
     }
 }
 
+TEST(UnitIdentity, GoesOnBehindALineThatTellsNothing) {
+    const sRBODMap map = identity("RBOD#3\nM:\nX:1\nS\nM:model\nS:serial\n");
+    EXPECT_STREQ(map.model, "model");
+    EXPECT_STREQ(map.sn, "serial");
+}
+
 TEST(UnitIdentity, EndsAtTheFirstLineThatBeginsWithI) {
     EXPECT_STREQ(identity("RBOD#3\nM:a\nInfo\nM:b\n").model, "a");
     EXPECT_STREQ(identity("RBOD#3\nM:a\n:I\nM:b\n").model, "a");
