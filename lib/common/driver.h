@@ -29,6 +29,17 @@ class Driver {
         return ZAV_RC_ERR_EACCES;
     }
 
+    // ZAV_RC_ERR, which is not logged, if the driver refuses.
+    int put(const char *reporter, void *record) const {
+        const int answer = request(kPut, record);
+        if (answer == 0)
+            return ZAV_RC_OK;
+        if (answer != -ENOMEM) // the queue is full, as told by a driver that answers with the error
+            return ZAV_RC_ERR;
+        log_error(reporter, ENOMEM);
+        return ZAV_RC_ERR_ENOMEM;
+    }
+
     int request(Request number, void *record) const { return ioctl(device_.get(), number, record); }
 
     static void log_error(const char *reporter, int error) {

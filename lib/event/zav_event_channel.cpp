@@ -59,15 +59,7 @@ int zavPushEvent(zavSystemEvent *event) {
     const Driver driver(kDevice);
     if (const int rc = driver.check(__func__); rc != ZAV_RC_OK)
         return rc;
-    switch (driver.request(Driver::kPut, event)) {
-    case 0:
-        return ZAV_RC_OK;
-    case -ENOMEM: // the queue is full, as told by a driver that answers with the error itself
-        Driver::log_error(__func__, ENOMEM);
-        return ZAV_RC_ERR_ENOMEM;
-    default:
-        return ZAV_RC_ERR;
-    }
+    return driver.put(__func__, event);
 }
 
 int zavPollPrivateEvent(zavSystemEvent *event) {

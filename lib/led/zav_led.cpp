@@ -191,16 +191,10 @@ int zavLEDAlarm(int priority, int ledcode, int state) {
     if (const int rc = driver.check(__func__); rc != ZAV_RC_OK)
         return rc;
     zavLEDEvent event = {priority, ledcode, state};
-    switch (driver.request(Driver::kPut, &event)) {
-    case 0:
-        return ZAV_RC_OK;
-    case -ENOMEM: // as told by a driver that answers with the error itself
-        Driver::log_error(__func__, ENOMEM);
-        return ZAV_RC_ERR_ENOMEM;
-    default:
+    const int rc = driver.put(__func__, &event);
+    if (rc == ZAV_RC_ERR)
         ZAV_LOG(zav::kAlert, ZAV_RC_ERR, "Unknown error");
-        return ZAV_RC_ERR;
-    }
+    return rc;
 }
 
 int zavLEDPollAlarm(zavLEDEvent *ledevent) {

@@ -108,6 +108,16 @@ class Appliance : public ::testing::Test {
     // The value of the semaphore with that key; -1 if there is none.
     static int semaphore_value(int key);
 
+    // What a call of the library answers. It must leave no descriptor open and no child behind.
+    template <class Call>
+    static auto checked(const Call &call) {
+        const size_t open_before = open_descriptors();
+        const auto answer = call();
+        EXPECT_EQ(open_descriptors(), open_before);
+        EXPECT_FALSE(has_children());
+        return answer;
+    }
+
     // Number of descriptors that the process has open.
     static size_t open_descriptors();
     // Is there a child that was not waited for?

@@ -29,13 +29,6 @@ class ChassisMark : public harness::Appliance {
         put(kVolume, bytes);
     }
 
-    template <class Call>
-    static int checked(const Call &call) {
-        const size_t open_before = open_descriptors();
-        const int rc = call();
-        EXPECT_EQ(open_descriptors(), open_before);
-        return rc;
-    }
     int set() {
         return checked([this] { return zavSetiRBOD(&unit); });
     }

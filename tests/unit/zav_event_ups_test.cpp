@@ -30,9 +30,7 @@ class Ups : public harness::Appliance {
 
     int ask() {
         info = {9, 9.0F, 9};
-        const size_t open_before = open_descriptors();
-        const int rc = zavGetStateUPS(&info);
-        EXPECT_EQ(open_descriptors(), open_before);
+        const int rc = checked([&] { return zavGetStateUPS(&info); });
         if (rc != ZAV_RC_OK) {
             EXPECT_EQ(info.type, 9) << "untouched in every failure";
             EXPECT_EQ(info.charge, 9.0F);

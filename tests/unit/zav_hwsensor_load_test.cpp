@@ -32,13 +32,6 @@ class Load : public harness::Appliance {
         record().file_system = system;
     }
 
-    template <class Call>
-    static int checked(const Call &call) {
-        const size_t open_before = open_descriptors();
-        const int rc = call();
-        EXPECT_EQ(open_descriptors(), open_before);
-        return rc;
-    }
     int ask(int probe) {
         info = {9, 9, 9.0F, 9};
         return checked([&] { return zavGetStateSysinfo(probe, &info); });

@@ -19,14 +19,6 @@ class Sensors : public harness::Appliance {
   protected:
     Sensors() { four_disk_model(); }
 
-    template <class Call>
-    static int checked(const Call &call) {
-        const size_t open_before = open_descriptors();
-        const int rc = call();
-        EXPECT_EQ(open_descriptors(), open_before);
-        return rc;
-    }
-
     using Query = int (*)(int, zavFanState *);
     int ask(Query query, int probe) {
         info = {9, 9, 9.0F, 9};

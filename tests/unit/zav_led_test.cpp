@@ -31,13 +31,6 @@ class Leds : public harness::Appliance {
 
     static std::string line(const std::string &name) { return get(kGpio + name); }
 
-    template <class Call>
-    static int checked(const Call &call) {
-        const size_t open_before = open_descriptors();
-        const int rc = call();
-        EXPECT_EQ(open_descriptors(), open_before);
-        return rc;
-    }
     static int set(int led, int state) {
         return checked([=] { return zavSetLED(led, state); });
     }
@@ -205,17 +198,11 @@ class LedAlarm : public harness::Appliance {
     LedAlarm() { put("/dev/zavledevent", ""); }
 
     static int alarm() {
-        const size_t open_before = open_descriptors();
-        const int rc = zavLEDAlarm(3, 7, 0x2501);
-        EXPECT_EQ(open_descriptors(), open_before);
-        return rc;
+        return checked([] { return zavLEDAlarm(3, 7, 0x2501); });
     }
     int poll() {
         event = {9, 9, 9};
-        const size_t open_before = open_descriptors();
-        const int rc = zavLEDPollAlarm(&event);
-        EXPECT_EQ(open_descriptors(), open_before);
-        return rc;
+        return checked([this] { return zavLEDPollAlarm(&event); });
     }
 
     static void driver_answers(int answer) {

@@ -18,11 +18,7 @@ class Nic : public harness::Appliance {
     int ask(int minor, int number) {
         dev = {ZAV_DEV_NIC, minor, number, 0};
         info = {9, {9, 9, 9, 9}, 9, 9};
-        const size_t open_before = open_descriptors();
-        const int rc = zavGetStateNic(&dev, &info);
-        EXPECT_EQ(open_descriptors(), open_before);
-        EXPECT_FALSE(has_children());
-        return rc;
+        return checked([this] { return zavGetStateNic(&dev, &info); });
     }
     int port(int number) { return ask(ZAV_MINDEV_NIC_ETH, number); }
     int bond(int number) { return ask(ZAV_MINDEV_NIC_BOND, number); }
