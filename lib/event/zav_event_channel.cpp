@@ -22,8 +22,14 @@ int taken(const char *function, int answer) {
     return ZAV_RC_ERR;
 }
 
-int take(const Driver &driver, Driver::Request request, zavSystemEvent *event) {
+// All of it, whichever record it will hold.
+void clear(zavSystemEvent *event) {
+    // cppcheck-suppress memsetClassFloat ; zero bits are the number 0
     memset(event, 0, sizeof *event);
+}
+
+int take(const Driver &driver, Driver::Request request, zavSystemEvent *event) {
+    clear(event);
     return driver.request(request, event);
 }
 
@@ -67,7 +73,7 @@ int zavPollPrivateEvent(zavSystemEvent *event) {
         Driver::log_error(__func__, EINVAL);
         return ZAV_RC_ERR_EINVAL;
     }
-    memset(event, 0, sizeof *event);
+    clear(event);
     const Driver driver(kDevice);
     if (const int rc = driver.check(__func__); rc != ZAV_RC_OK)
         return rc;

@@ -5,8 +5,11 @@
 #include "common/text.h"
 #include "zav_api.h"
 
+#include <algorithm>
 #include <cerrno>
+#include <cstdint>
 #include <cstdio>
+#include <cstdlib>
 #include <cstring>
 #include <iterator>
 #include <unistd.h>
@@ -236,13 +239,17 @@ int zavGetSensorIn(unsigned char *state) {
     const zav::File port(kPortIn, "re");
     if (!port)
         return refuse_port(__func__, "in");
-    unsigned bits = 0;
-    if (fscanf(port.get(), "%X", &bits) != 1)
+    char text[64];
+    text[fread(text, 1, sizeof text - 1, port.get())] = '\0';
+    char *end = text;
+    const unsigned long long bits = strtoull(text, &end, 16);
+    if (end == text)
         return ZAV_RC_ERR_EACCES;
-    *state = static_cast<unsigned char>(bits);
+    *state = static_cast<unsigned char>(std::min<unsigned long long>(bits, UINT32_MAX));
     return ZAV_RC_OK;
 }
 
+// NOLINTNEXTLINE(readability-non-const-parameter): the interface's type
 int zavSetSensorOut(unsigned char *state) {
     if (state == nullptr)
         return ZAV_RC_ERR_EINVAL;

@@ -383,7 +383,8 @@ class SensorPort : public Sensors {};
 
 TEST_F(SensorPort, IsReadAsAHexadecimalByte) {
     const std::pair<const char *, int> rows[] = {
-        {"A", 0x0A}, {"ff\n", 0xFF}, {" 0x1F", 0x1F}, {"123", 0x23}, {"0", 0}};
+        {"A", 0x0A}, {"ff\n", 0xFF}, {" 0x1F", 0x1F},    {"123", 0x23},
+        {"0", 0},    {"\n 7", 7},    {"100000001", 0xFF}};
     for (const auto &[text, expected] : rows) {
         put(kPortIn, text);
         unsigned char byte = 0x55;
