@@ -5,6 +5,8 @@
 #include "severity.h"
 #include "text.h"
 
+#include "zav_event.h"
+
 #include <optional>
 #include <string>
 #include <vector>
@@ -34,6 +36,10 @@ struct Section {
     Json records = Json::array();   // one per thing, or one object
     std::vector<Finding> findings;  // what is not well
     std::string well;               // what to say when nothing is wrong: "4 disks found"
+
+    // The library's own records of the things, as it answered them; none of what gave no answer.
+    // `watch --push` hands them to the event driver.
+    std::vector<zavSystemEvent> events{};
 };
 
 struct Answer {

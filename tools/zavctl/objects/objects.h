@@ -1,5 +1,5 @@
 // The objects of zavctl. A new one is a file with its add_ function and a line in objects.cpp;
-// what it has to say in `zavctl status` is a line in the table of status.cpp.
+// what it has to say of the whole appliance is a line in the table of appliance.cpp.
 #pragma once
 
 #include "../core/model_report.h"
