@@ -36,6 +36,11 @@ constexpr const char *footer =
     "  unit U volume degrades | fails | rebuilds | recovers\n"
     "  unit U temperature 88 | voltage 1.1\n"
     "  report is missing | is truncated | is garbled | rewrites 5s | works again\n"
+    "  temperature N is 78 | latches | faults | recovers\n"
+    "  sensor N is missing | works again\n"
+    "  voltage N is 5.6 | latches | faults | recovers\n"
+    "  fan N slows 700 | stops | recovers\n"
+    "  input is 3F\n"
     "  tool NAME hangs 30s | prints \"TEXT\" | exits N | is missing | works again";
 
 class HelpPage : public CLI::Formatter {

@@ -1,6 +1,7 @@
 // What can happen to the appliance, from outside it.
 #pragma once
 
+#include "model/action.hpp"
 #include "model/state.hpp"
 
 #include <string>

@@ -1,6 +1,7 @@
 // What can happen to a RAID controller, its disks and its expansion units.
 #pragma once
 
+#include "model/action.hpp"
 #include "model/state.hpp"
 
 #include <string>

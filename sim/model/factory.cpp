@@ -3,6 +3,7 @@
 #include "model/arrays.hpp"
 #include "model/disks.hpp"
 #include "model/enclosures.hpp"
+#include "model/sensors.hpp"
 #include "model/volumes.hpp"
 
 #include <array>
@@ -179,6 +180,8 @@ State new_appliance(const Wishes &wishes) {
     state.current_tools = wishes.current_tools;
     state.time_scale = wishes.time_scale;
     state.hosts_below_ata = wishes.hosts_below_ata;
+    state.sensors = new_sensors();
+    state.registers = new_registers();
     const int disks = identity_of(wishes.model).disks;
     for (int slot = 1; slot <= disks; ++slot)
         state.disks.push_back(new_disk(state, slot));

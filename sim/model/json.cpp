@@ -66,11 +66,13 @@ NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(Controller, enclosures, report_fault, slow_re
                                    rewrite_seconds)
 NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(ToolFault, tool, hangs, prints, exits, missing)
 NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(Event, at, sentence)
+NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(Probe, value, status, missing)
+NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(Sensors, temperatures, voltages, fans, input)
 NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(State, model, data_level, current_tools, hosts_below_ata,
                                    time_scale, real_start, now, rebuild_kib_per_second, next_serial,
                                    next_sync_order, next_id, disks, arrays, stopped,
-                                   physical_volumes, groups, controller, faults, scenario,
-                                   scsi_hosts, notes)
+                                   physical_volumes, groups, controller, sensors, registers, faults,
+                                   scenario, scsi_hosts, notes)
 
 std::string to_text(const State &state) {
     // A garbled tool text may hold any bytes.

@@ -86,6 +86,25 @@ Sentence wrong(const std::string &error) {
     return {{}, error};
 }
 
+std::vector<Word> without_first(const std::vector<Word> &words, std::ptrdiff_t count) {
+    return {words.begin() + count, words.end()};
+}
+
+bool are(const std::vector<Word> &words, const std::vector<std::string> &texts) {
+    if (words.size() != texts.size())
+        return false;
+    for (std::size_t i = 0; i < words.size(); ++i)
+        if (words[i].text != texts[i])
+            return false;
+    return true;
+}
+
+Sentence of_kind(Action::Kind kind) {
+    Action action;
+    action.kind = kind;
+    return {action, {}};
+}
+
 Sentence numbered_noun(const std::vector<Word> &words, int most, const std::vector<Verb> &verbs,
                        const std::string &allowed) {
     const std::string &noun = words[0].text;
@@ -94,10 +113,9 @@ Sentence numbered_noun(const std::vector<Word> &words, int most, const std::vect
         return wrong(fmt::format("{} wants a number from 1 to {}", noun, most));
     for (const Verb &verb : verbs)
         if (words.size() == 3 && words[2].text == verb.word) {
-            Action action;
-            action.kind = verb.kind;
-            action.number = *number;
-            return {action, {}};
+            Sentence sentence = of_kind(verb.kind);
+            sentence.action.number = *number;
+            return sentence;
         }
     return wrong(fmt::format("{} {} {}", noun, *number, allowed));
 }

@@ -3,6 +3,7 @@
 
 #include "model/sentences.hpp"
 
+#include <cstddef>
 #include <optional>
 #include <string>
 #include <vector>
@@ -31,6 +32,10 @@ std::optional<double> decimal_number(const std::string &text, std::size_t places
 std::optional<double> duration(const std::string &text);
 
 Sentence wrong(const std::string &error);
+Sentence of_kind(Action::Kind kind);
+
+std::vector<Word> without_first(const std::vector<Word> &words, std::ptrdiff_t count);
+bool are(const std::vector<Word> &words, const std::vector<std::string> &texts);
 
 struct Verb {
     const char *word;
@@ -45,5 +50,12 @@ Sentence numbered_noun(const std::vector<Word> &words, int most, const std::vect
 Sentence about_controller(const std::vector<Word> &words);
 Sentence about_unit(const std::vector<Word> &words);
 Sentence about_report(const std::vector<Word> &words);
+
+// Sentences about the sensors of the main board.
+Sentence about_temperature(const std::vector<Word> &words);
+Sentence about_sensor(const std::vector<Word> &words);
+Sentence about_voltage(const std::vector<Word> &words);
+Sentence about_fan(const std::vector<Word> &words);
+Sentence about_input(const std::vector<Word> &words);
 
 } // namespace zavsim

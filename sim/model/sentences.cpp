@@ -107,23 +107,41 @@ Sentence about_tool(const std::vector<Word> &words) {
     return words.size() == 4 ? tool_state(action, words[2], words[3]) : tool_state(action, {}, {});
 }
 
+struct Noun {
+    const char *word;
+    Sentence (*read)(const std::vector<Word> &words);
+};
+
+constexpr std::array<Noun, 12> nouns = {{{"disk", about_disk},
+                                         {"array", about_array},
+                                         {"volume", about_volume},
+                                         {"controller", about_controller},
+                                         {"unit", about_unit},
+                                         {"report", about_report},
+                                         {"temperature", about_temperature},
+                                         {"sensor", about_sensor},
+                                         {"voltage", about_voltage},
+                                         {"fan", about_fan},
+                                         {"input", about_input},
+                                         {"tool", about_tool}}};
+
+std::string list_of_nouns() {
+    std::string list;
+    for (const Noun &noun : nouns)
+        list += fmt::format("{}{}",
+                            list.empty()             ? ""
+                            : &noun == &nouns.back() ? " or "
+                                                     : ", ",
+                            noun.word);
+    return list;
+}
+
 Sentence from_words(const std::vector<Word> &words) {
-    const std::string noun = words.empty() ? "" : words.front().text;
-    if (noun == "disk")
-        return about_disk(words);
-    if (noun == "array")
-        return about_array(words);
-    if (noun == "volume")
-        return about_volume(words);
-    if (noun == "tool")
-        return about_tool(words);
-    if (noun == "controller")
-        return about_controller(words);
-    if (noun == "unit")
-        return about_unit(words);
-    if (noun == "report")
-        return about_report(words);
-    return wrong("a sentence begins with disk, array, volume, controller, unit, report or tool");
+    const std::string first = words.empty() ? "" : words.front().text;
+    for (const Noun &noun : nouns)
+        if (first == noun.word)
+            return noun.read(words);
+    return wrong("a sentence begins with " + list_of_nouns());
 }
 
 // One line of a scenario: nothing, or "at TIME SENTENCE".

@@ -1,6 +1,7 @@
 // The scenario language: a sentence says what happens, a line of a scenario also when.
 #pragma once
 
+#include "model/action.hpp"
 #include "model/state.hpp"
 
 #include <string>

@@ -13,19 +13,6 @@ const std::vector<Verb> volume_verbs = {{"degrades", Action::Kind::raid_volume_d
                                         {"recovers", Action::Kind::raid_volume_recovers}};
 constexpr const char *volume_words = "degrades, fails, rebuilds or recovers";
 
-std::vector<Word> without_first(const std::vector<Word> &words, std::ptrdiff_t count) {
-    return {words.begin() + count, words.end()};
-}
-
-bool are(const std::vector<Word> &words, const std::vector<std::string> &texts) {
-    if (words.size() != texts.size())
-        return false;
-    for (std::size_t i = 0; i < words.size(); ++i)
-        if (words[i].text != texts[i])
-            return false;
-    return true;
-}
-
 Sentence in_unit(Sentence sentence, int unit) {
     sentence.action.unit = unit;
     if (!sentence.error.empty() && unit != 0)
@@ -57,12 +44,6 @@ constexpr Quantity temperature = {"temperature", Action::Kind::temperature_chang
                                   "temperature wants degrees from 0 to 200, such as 88 or 61.5"};
 constexpr Quantity voltage = {"voltage", Action::Kind::voltage_changes, 2, 20,
                               "voltage wants volts from 0 to 20, such as 1.1"};
-
-Sentence of_kind(Action::Kind kind) {
-    Action action;
-    action.kind = kind;
-    return {action, {}};
-}
 
 Sentence unit_volume(const std::vector<Word> &words) {
     for (const Verb &verb : volume_verbs)

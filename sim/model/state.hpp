@@ -2,6 +2,8 @@
 // (state, time), whatever shows it a function from state to text.
 #pragma once
 
+#include "model/health.hpp"
+
 #include <cstdint>
 #include <optional>
 #include <string>
@@ -185,56 +187,6 @@ struct ToolFault {
     bool missing = false;
 };
 
-// One sentence of the scenario language, taken apart.
-struct Action {
-    enum class Kind {
-        disk_fails,
-        disk_vanishes,
-        disk_appears,
-        disk_joins,
-        disk_detaches,
-        disk_attaches,
-        array_checks,
-        array_repairs,
-        array_stops,
-        volume_fills,
-        volume_is_active,
-        volume_is_inactive,
-        volume_is_busy,
-        volume_is_idle,
-        tool_hangs,
-        tool_prints,
-        tool_exits,
-        tool_is_missing,
-        tool_works,
-        raid_volume_degrades,
-        raid_volume_fails,
-        raid_volume_rebuilds,
-        raid_volume_recovers,
-        unit_vanishes,
-        unit_appears,
-        unit_loses_link,
-        unit_finds_link,
-        temperature_changes,
-        voltage_changes,
-        report_is_missing,
-        report_is_truncated,
-        report_is_garbled,
-        report_rewrites,
-        report_works
-    };
-    Kind kind = Kind::disk_fails;
-    int number = 0;   // disk, array or volume, counted from 1
-    int unit = 0;     // expansion unit; 0 for the controller
-    double value = 0; // of a reading
-    int group = 0;    // of the volume; 0 is the system's
-    int percent = 0;
-    std::string tool;
-    double seconds = 0;
-    std::string text;
-    int status = 0;
-};
-
 struct Event {
     double at = 0;
     std::string sentence;
@@ -258,6 +210,8 @@ struct State {
     std::vector<PhysicalVolume> physical_volumes; // a group's in the order in which it got them
     std::vector<Group> groups;                    // in the order in which they were made
     std::optional<Controller> controller;
+    Sensors sensors;
+    Registers registers;
     std::vector<ToolFault> faults;
     std::vector<Event> scenario; // what is still to come, soonest first
     std::vector<int> scsi_hosts; // hosts with a device, in the order in which the kernel found them

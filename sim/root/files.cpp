@@ -2,6 +2,7 @@
 
 #include <array>
 #include <cerrno>
+#include <chrono>
 #include <fcntl.h>
 #include <fstream>
 #include <iterator>
@@ -44,6 +45,10 @@ void overwrite_text(const fs::path &path, const std::string &text) {
     if (file.get() < 0 || pwrite(file.get(), text.data(), text.size(), 0) != size ||
         ftruncate(file.get(), size) != 0)
         throw std::system_error(errno, std::generic_category(), path);
+}
+
+bool is_fresh(const fs::path &path) {
+    return fs::file_time_type::clock::now() - fs::last_write_time(path) < std::chrono::seconds(1);
 }
 
 void point_link(const fs::path &link, const std::string &target) {

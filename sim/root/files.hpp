@@ -18,6 +18,9 @@ void write_text(const std::filesystem::path &path, const std::string &text);
 // no moment is it shorter than the old text and the new.
 void overwrite_text(const std::filesystem::path &path, const std::string &text);
 
+// Whether it was written within the last second: one that is empty may be about to be written.
+bool is_fresh(const std::filesystem::path &path);
+
 // Makes or corrects a symbolic link.
 void point_link(const std::filesystem::path &link, const std::string &target);
 

@@ -8,7 +8,6 @@
 #include "root/report.hpp"
 #include "tools/tools.hpp"
 
-#include <chrono>
 #include <filesystem>
 #include <fmt/format.h>
 #include <map>
@@ -178,10 +177,6 @@ void publish_tools(const State &state) {
 
 constexpr const char *scsi_file = "/proc/scsi/scsi";
 
-bool is_fresh(const fs::path &path) {
-    return fs::file_time_type::clock::now() - fs::last_write_time(path) < std::chrono::seconds(1);
-}
-
 // Whether a writer has the file: a command that nobody took yet, or emptied for one to come.
 bool belongs_to_writer(const std::string &text, const std::string &taken_command) {
     return text.empty() ? is_fresh(scsi_file)
@@ -197,16 +192,17 @@ void publish_scsi(const std::string &list, const std::string &taken_command) {
 
 } // namespace
 
-bool publish(const State &state, const std::string &taken_command) {
+bool publish(const State &state, const Taken &taken) {
     write_text("/proc/mdstat", mdstat_text(state));
     publish_devices(state);
     publish_labels(state);
     publish_ports(state);
     publish_mounts(state);
     publish_tools(state);
+    publish_driver_files(state, taken.driver_files);
     const bool shown = publish_report(state);
     // The last: who waits for a command to be done looks for the list in its place.
-    publish_scsi(scsi_text(state), taken_command);
+    publish_scsi(scsi_text(state), taken.scsi_command);
     return shown;
 }
 

@@ -2,13 +2,20 @@
 #pragma once
 
 #include "model/state.hpp"
+#include "root/driver_files.hpp"
 
 #include <string>
 
 namespace zavsim {
 
-// `taken_command` is what was found in /proc/scsi/scsi and acted on; another one that has come
-// since stays there for the next turn. False when something could not be shown yet.
-bool publish(const State &state, const std::string &taken_command);
+// What programs wrote into the appliance's files and a turn acted on. What has come since stays
+// there for the next turn.
+struct Taken {
+    std::string scsi_command; // found in /proc/scsi/scsi
+    DriverTexts driver_files;
+};
+
+// False when something could not be shown yet.
+bool publish(const State &state, const Taken &taken);
 
 } // namespace zavsim

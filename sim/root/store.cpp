@@ -7,7 +7,6 @@
 #include "model/json.hpp"
 #include "model/sentences.hpp"
 #include "root/clock.hpp"
-#include "root/publish.hpp"
 
 #include <cerrno>
 #include <fcntl.h>
@@ -49,12 +48,12 @@ std::string take_scsi_command(State &state) {
 
 Turn::Turn() : lock_(open_locked()), state_(load()) {
     advance(state_, (machine_seconds() - state_.real_start) * state_.time_scale);
-    taken_command_ = take_scsi_command(state_);
+    taken_ = {take_scsi_command(state_), take_driver_files(state_)};
 }
 
 bool Turn::commit() {
     write_text(state_file, to_text(state_));
-    return publish(state_, taken_command_);
+    return publish(state_, taken_);
 }
 
 void start_model(const Options &options) {

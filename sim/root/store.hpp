@@ -4,8 +4,7 @@
 #include "launcher/options.hpp"
 #include "model/state.hpp"
 #include "root/files.hpp"
-
-#include <string>
+#include "root/publish.hpp"
 
 namespace zavsim {
 
@@ -24,7 +23,7 @@ class Turn {
   private:
     Descriptor lock_;
     State state_;
-    std::string taken_command_;
+    Taken taken_;
 };
 
 } // namespace zavsim

@@ -169,7 +169,7 @@ TEST(Sentences, RefuseWhatTheyDoNotMean) {
                              "report works",
                              "report rewrites",
                              "report rewrites 5",
-                             "fan 1 stops"})
+                             "lamp 1 stops"})
         EXPECT_NE(parse_sentence(text).error, "") << text;
 }
 
