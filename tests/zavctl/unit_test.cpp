@@ -33,8 +33,8 @@ void add(sRBODSet &set, int number, int upper = no_unit, int lower = no_unit) {
     unit.lowerchildid = lower;
 }
 
-SensorReport sensor(double value, int state = ZAV_RBOD_NORMAL) {
-    SensorReport report;
+UnitSensor sensor(double value, int state = ZAV_RBOD_NORMAL) {
+    UnitSensor report;
     report.value = value;
     report.state = state;
     doubt_reading(report);
@@ -166,7 +166,7 @@ TEST(UnitReport, SensorStatesHaveTheirSeverity) {
 TEST(UnitReport, AReadingOfZeroOrNoNumberIsNoAnswer) {
     for (const double value : {0.0, std::nan(""), static_cast<double>(INFINITY)})
         for (const int state : {ZAV_RBOD_NORMAL, ZAV_RBOD_ALARM}) {
-            const SensorReport report = sensor(value, state);
+            const UnitSensor report = sensor(value, state);
             EXPECT_EQ(severity(report), Severity::unknown) << value;
             EXPECT_NE(report.doubt, "");
             EXPECT_EQ(sensor_text(report, "{:.1f} C"), "unknown");

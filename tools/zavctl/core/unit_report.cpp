@@ -55,7 +55,7 @@ bool cannot_be_told(const UnitReport &unit) {
     return unit.failure || !unit.doubt.empty() || is_beyond(unit);
 }
 
-Finding sensor_finding(const UnitReport &unit, const SensorReport &sensor, const std::string &name,
+Finding sensor_finding(const UnitReport &unit, const UnitSensor &sensor, const std::string &name,
                        const std::string &reading) {
     const Severity bad = severity(sensor);
     const std::string number = fmt::format("{}", unit.number);
@@ -69,7 +69,7 @@ Json text_or_null(const std::string &text) {
     return text.empty() ? Json(nullptr) : Json(text);
 }
 
-Json sensor_json(const SensorReport &sensor) {
+Json sensor_json(const UnitSensor &sensor) {
     Json json;
     json["value"] = sensor.failure ? Json(nullptr) : number_or_null(sensor.value);
     json["state"] = sensor_state_word(sensor);
@@ -108,7 +108,7 @@ std::vector<UnitReport> units_of(const sRBODSet &set) {
     return units;
 }
 
-std::string sensor_state_word(const SensorReport &sensor) {
+std::string sensor_state_word(const UnitSensor &sensor) {
     if (sensor.failure)
         return "unknown";
     switch (sensor.state) {
@@ -125,7 +125,7 @@ std::string sensor_state_word(const SensorReport &sensor) {
     }
 }
 
-Severity severity(const SensorReport &sensor) {
+Severity severity(const UnitSensor &sensor) {
     const std::string word = sensor_state_word(sensor);
     if (!sensor.doubt.empty() || word == "unknown")
         return Severity::unknown;
@@ -134,12 +134,12 @@ Severity severity(const SensorReport &sensor) {
     return word == "normal" ? Severity::ok : Severity::critical;
 }
 
-void doubt_reading(SensorReport &sensor) {
+void doubt_reading(UnitSensor &sensor) {
     if (!sensor.failure && (sensor.value == 0 || !std::isfinite(sensor.value)))
         sensor.doubt = no_reading;
 }
 
-std::string sensor_text(const SensorReport &sensor, const char *format) {
+std::string sensor_text(const UnitSensor &sensor, const char *format) {
     if (severity(sensor) == Severity::unknown)
         return "unknown";
     return fmt::format("{} {}", fmt::format(fmt::runtime(format), sensor.value),
@@ -172,7 +172,7 @@ std::string unit_note(const UnitReport &unit) {
         return fmt::format("does not answer: a link of unit {} leads to it", unit.linked_from);
     if (!unit.present)
         return "no unit has this place in the cascade";
-    for (const SensorReport *sensor : {&unit.temperature, &unit.voltage})
+    for (const UnitSensor *sensor : {&unit.temperature, &unit.voltage})
         if (sensor->failure || !sensor->doubt.empty())
             return sensor->failure ? in_words(*sensor->failure) : sensor->doubt;
     return "";

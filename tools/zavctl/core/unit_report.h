@@ -13,7 +13,7 @@
 namespace zavctl {
 
 // Temperature or voltage of a unit's processor.
-struct SensorReport {
+struct UnitSensor {
     double value = 0;
     int state = 0; // ZAV_RBOD_*
     std::optional<Failure> failure;
@@ -31,8 +31,8 @@ struct UnitReport {
     int parent = -1;    // numbers of the neighbours; 0 is the controller, -1 none
     int upper_child = -1;
     int lower_child = -1;
-    SensorReport temperature;
-    SensorReport voltage;
+    UnitSensor temperature;
+    UnitSensor voltage;
     EnclosureReport enclosure;
     std::optional<Failure> failure; // nothing is known of it
     std::string doubt;              // why it is not known whether it is there, "" if it is
@@ -52,17 +52,17 @@ struct CascadeReport {
 std::vector<UnitReport> units_of(const sRBODSet &set);
 
 // "normal", "warning", "alarm", "failed", "unknown".
-std::string sensor_state_word(const SensorReport &sensor);
-Severity severity(const SensorReport &sensor);
+std::string sensor_state_word(const UnitSensor &sensor);
+Severity severity(const UnitSensor &sensor);
 
 // What a reading of 0, or one that is no number, means. To be called with every answer.
-void doubt_reading(SensorReport &sensor);
+void doubt_reading(UnitSensor &sensor);
 
 // "present", "missing", "unknown".
 std::string unit_state_word(const UnitReport &unit);
 Severity severity(const UnitReport &unit);
 std::string unit_note(const UnitReport &unit);
-std::string sensor_text(const SensorReport &sensor, const char *format);
+std::string sensor_text(const UnitSensor &sensor, const char *format);
 
 // What is not well with a unit: more than one thing may be.
 std::vector<Finding> unit_findings(const UnitReport &unit);

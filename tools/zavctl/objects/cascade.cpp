@@ -97,9 +97,9 @@ bool borrows_readings(int unit) {
     return false;
 }
 
-SensorReport asked_sensor(int unit, int id) {
+UnitSensor asked_sensor(int unit, int id) {
     const library::UnitAnswer answer = library::unit_state(unit, id);
-    SensorReport sensor;
+    UnitSensor sensor;
     sensor.state = answer.state.state;
     sensor.value = as_written(answer.state.value).value_or(0);
     sensor.failure = library::failure_of(answer.result);
@@ -119,7 +119,7 @@ UnitReport with_sensors(UnitReport unit) {
     add_readings(unit.enclosure, unit_items,
                  [&unit](int item) { return library::unit_reading(unit.number, item); });
     if (borrows_readings(unit.number))
-        for (SensorReport *sensor : {&unit.temperature, &unit.voltage})
+        for (UnitSensor *sensor : {&unit.temperature, &unit.voltage})
             sensor->doubt = "the unit's section of the RAID controller's report has no monitor "
                             "line: this is the next one's";
     return unit;
