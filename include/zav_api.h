@@ -503,8 +503,8 @@ void getsasaddr(char *line, char *sasaddr);
  *                    ZAV_RBOD_WARN, from 85 on ZAV_RBOD_ALARM
  * ZAV_RBOD_VOLT_CPU  `value` in volts: between 1.08 and 1.32 ZAV_RBOD_NORMAL, up to 0.96 and from
  *                    1.44 on ZAV_RBOD_ALARM, in between ZAV_RBOD_WARN. A report's 1.08 is NORMAL,
- *                    its 1.32 is WARN, its 1.44 and 0.96 are ALARM: the reading has single
- * precision. any other          ZAV_RBOD_NORMAL
+ *                    its 1.32 is WARN, its 1.44 and 0.96 are ALARM (single precision).
+ * any other          ZAV_RBOD_NORMAL
  *
  * ZAV_RC_OK          as above. A value of 0 may also be a monitor line that is missing.
  * ZAV_RC_ERR_EINVAL  null pointer, number of the unit; record untouched
@@ -1062,6 +1062,169 @@ int zavMapRBODCCV(int *ccv);
  */
 int zavSetiRBOD(sRBOD *rbod);
 int zavGetiRBOD(sRBOD *rbod, int *state);
+
+/* ==== Optical burner ==========================================================================
+ *
+ * One drive, /dev/scd0, and one job at a time: all work files have fixed names below /tmp
+ * (progress.outfile, dvd.outfile, cd.outfile, burnDir, linkDir). The library opens no link of these
+ * names; the tools' own redirections rely on the kernel's fs.protected_symlinks. Sizes are in
+ * kilobytes of 1024 bytes. The jobs run in the caller's thread; zavCDProgress and the cancel
+ * functions are meant for another thread or process.
+ */
+
+/** Are cdrecord, mkisofs, growisofs, dvd+rw-mediainfo, dvd+rw-format, cdrwtool, pktsetup and
+ * mkudffs on the search path? ZAV_RC_OK, or ZAV_RC_ERR. */
+int checkExternalBin(void);
+
+/**
+ * Type, state and room of the disc in the drive, from dvd+rw-mediainfo, for a CD from cdrecord and
+ * the drive itself. A writable DVD has 4590000 kilobytes in all, one of two layers 8347000,
+ * whatever is on it; DVD-ROM and DVD-RAM have 0: their room is not known. Of an overwritable disc
+ * (DVD+RW, restricted DVD-RW) everything is room that /media/cdrom does not use. The room may be
+ * negative. `flag` has no meaning.
+ *
+ * ZAV_RC_OK          filled; without a disc ZAV_DISC_NONE, ZAV_DISC_STATE_UNKNOWN and no sizes
+ * ZAV_RC_ERR_EINVAL  null pointer
+ * ZAV_RC_ERR         no node of the drive, or dvd+rw-mediainfo writes nothing: record untouched;
+ *                    cdrecord cannot read the CD: what was read before is filled
+ * ZAV_RC_ERR_ENOENT  a tool's report cannot be opened, or is a link
+ *
+ * A report that names no sectors leaves the room at 0, or the state unknown.
+ *
+ * THIS CALL CAN END THE CALLING PROCESS while a CD is in the drive: with status 1 when the drive
+ * cannot be opened or asked, with status 0 when wait_cmd does. Call it in a child process. The same
+ * holds for everything below that queries the disc: zavCDBurn and its kin, zavCDBlank, zavCDFormat.
+ *
+ * Blocks as long as the tools do, which is some ten seconds after a disc was inserted.
+ */
+int zavQueryDisc(zavMediaInfo *info, int flag);
+
+/** 0 for a drive that writes CDs but not DVD-R, 1 for others and when the kernel does not say;
+ *  ZAV_RC_ERR_ENOENT without the kernel's table of drives. */
+int zavIsComboDrive(void);
+
+/** Opens the tray. Nothing tells whether it did. */
+void zavEjectDVD(void);
+
+/** Resets the drive; prints "CDROM Resetfailed" if that is refused. */
+void cdrom_reset(void);
+
+/** Makes the kernel detach the drive from its bus and attach it again. Does nothing when the kernel
+ *  names no address for it. Nothing in the library calls it. */
+void rm_add_odd(void);
+
+/**
+ * Sends one packet command to the open drive `fd`: fills the timeout, buffer, length and direction
+ * (CGC_DATA_*) into `cgc`, whose command bytes are the caller's. Returns what the ioctl does, -1
+ * for a null `cgc`. A failure is told on standard error unless `quiet` is set. Sense data whose
+ * byte 15 has its top bit set END THE CALLING PROCESS with status 0, after a line on standard
+ * output.
+ */
+struct cdrom_generic_command;
+int wait_cmd(int fd, struct cdrom_generic_command *cgc, void *buffer, int buflen, int ddir,
+             int timeout, int quiet);
+
+/**
+ * Burns the contents of the directory to the root of the disc, as ISO 9660 with Rock Ridge and
+ * Joliet names; what symbolic links lead to is burned. Session types: 0 closes the disc, 1 leaves
+ * it open for more or adds to it, 2 overwrites it from its start.
+ *
+ *               blank     appendable             complete   session types taken
+ *   DVD-R, DVD+R, DVD+R DL, CD-R, CD-RW
+ *               0, 1      1                      -
+ *   DVD-RW      0         -                      -          sequential
+ *   DVD-RW      any but 0 1, 2 (both overwrite)  1, 2       restricted overwrite
+ *   DVD+RW      any but 0 1, 2                   1, 2
+ *
+ * ZAV_RC_OK            burned
+ * ZAV_RC_ERR_EINVAL    null pointer; a session type that the disc does not take
+ * ZAV_RC_ERR_ENOENT    the directory cannot be opened; a tool's report cannot be opened
+ * ZAV_RC_ERR_BADDISC   the disc cannot take this session, or the drive not this disc
+ * ZAV_RC_ERR_NODISC    no disc
+ * ZAV_RC_ERR_EFBIG     too large: for the disc's total size (session types 0 and 2) or its room
+ * (1); also a source that du does not measure ZAV_RC_ERR_CDTOOL    cdrecord or mkisofs failed (the
+ * burn itself is logged), or told no number ZAV_RC_ERR_BURNER    growisofs failed (logged)
+ * ZAV_RC_ERR           the progress file cannot be written
+ * others               as zavQueryDisc returns them
+ *
+ * growisofs asks before it overwrites data when a terminal is on its standard input. Blocks as long
+ * as the burn takes, 4 seconds more after it, and as long as zavQueryDisc.
+ */
+int zavCDBurn(char *sourceDir, int sessionType);
+
+/** The same, with the directory's contents below a directory `destDir` of the disc; "" is the root.
+ *  `sourceDir` must be an absolute path then. Also ZAV_RC_ERR_EINVAL for a null pointer, a
+ * backslash or slash in `destDir`, "." and "..", and when the link cannot be made. Call cleanUp
+ * before if an earlier burn may have been killed: the link would be made beside what that left. */
+int zavCDBurnEx(char *sourceDir, char *destDir, int sessionType);
+
+/** Burns one file, absolute path, to the root of the disc, or into a directory of it, as a session
+ *  of type 1. Codes as for zavCDBurn and zavCDBurnEx; ZAV_RC_ERR_ENOENT also for a file that cannot
+ *  be read and a path without a slash. */
+int zavCDBurnFile(char *filepath);
+int zavCDBurnFileEx(char *filepath, char *destDir);
+
+/**
+ * Erases a rewritable disc: a CD quickly, a DVD by an empty file system, one that asks for it by a
+ * full format before. Meanwhile a thread of the library writes a simulated progress.
+ *
+ * ZAV_RC_OK           erased, or blank already
+ * ZAV_RC_ERR_BADDISC  not a rewritable disc; a DVD in a combo drive
+ * ZAV_RC_ERR_NODISC   no disc
+ * ZAV_RC_ERR_BLANK    a tool failed, or there is no thread to be had
+ * ZAV_RC_ERR_EINVAL   a type of disc that is not known
+ * ZAV_RC_ERR          the progress file cannot be written
+ * others              as zavQueryDisc returns them
+ *
+ * The thread ends by itself, after 24 seconds for a CD, 9 for a DVD, 16 minutes for a format, and
+ * is never waited for: until then it goes on writing the progress file. The process may end, and
+ * the library be unloaded (it stays in memory), at any time. Blocks as long as the tools do, 3 to 5
+ * seconds more for a DVD.
+ */
+int zavCDBlank(void);
+
+/**
+ * Prepares a disc for packet writing through /dev/pktcdvd/pktcdvd0: a DVD+RW or CD-RW gets an empty
+ * UDF file system. Writes no progress.
+ *
+ * ZAV_RC_OK            formatted
+ * ZAV_RC_ERR_PKTSETUP  the packet device cannot be set up
+ * ZAV_RC_ERR_FORMAT    mkudffs or cdrwtool failed
+ * ZAV_RC_ERR_BADDISC   any other disc, or none; the packet device stays set up
+ * others               as zavQueryDisc returns them
+ */
+int zavCDFormat(void);
+
+/**
+ * Progress of the running job in percent, counted from where the first line of the progress file
+ * began; the last line of it counts. 0 when there is no such file or it tells nothing, 100 after a
+ * success. A simulator that goes on after its job's end takes the 100 back.
+ */
+int zavCDProgress(void);
+
+/** Simulated progress, as zavCDBlank runs it in a thread: 24 lines 1 second apart, 96 lines 10
+ *  seconds apart, 9 lines 1 second apart. Each blocks for its whole course. */
+void setCDBlankProgress(void);
+void setDVDBlankProgress(void);
+void setDVDEmptyProgress(void);
+
+/**
+ * Kills every growisofs, cdrecord, mkisofs, dvd+rw-mediainfo and dvd+rw-format of the machine. The
+ * job's own call then returns its failure code. zavCDBurnSyncCancel waits until none is running,
+ * without a limit, looking every 3 seconds. Both always return ZAV_RC_OK.
+ */
+int zavCDBurnCancel(void);
+int zavCDBurnSyncCancel(void);
+
+/**
+ * The number of the `_sequence`-th running process, from 1, with exactly this name, in the order in
+ * which /proc lists them. The kernel keeps 15 characters of a name: a longer one is never found.
+ * 1 if there is none; 22 for a null pointer or 0; 2 when /proc cannot be opened.
+ */
+unsigned long PIDOF(const char *_process_name, unsigned int _sequence);
+
+/** Removes /tmp/burnDir, /tmp/linkDir and /tmp/zav.iso. */
+void cleanUp(void);
 
 #ifdef __cplusplus
 }

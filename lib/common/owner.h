@@ -24,6 +24,13 @@ class File {
         file_ = fopen(path, mode);
     }
 
+    // Takes an open descriptor over, unless there is no memory for it.
+    bool adopt(int fd, const char *mode) {
+        close();
+        file_ = fdopen(fd, mode);
+        return file_ != nullptr;
+    }
+
     void close() {
         if (file_ != nullptr)
             fclose(std::exchange(file_, nullptr));

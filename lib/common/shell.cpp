@@ -56,8 +56,13 @@ void Command::add(char character) {
     text_[length_++] = character;
 }
 
+// Behind these a word goes on: "/tmp/burnDir/-x" is no option.
+bool Command::begins_a_word() const {
+    return length_ == 0 || strchr("/=", text_[length_ - 1]) == nullptr;
+}
+
 void Command::add_word(const char *word, bool in_backquotes) {
-    if (*word == '-')
+    if (*word == '-' && begins_a_word())
         valid_ = false;
     if (is_plain(word)) {
         while (*word != '\0')

@@ -1,6 +1,7 @@
 // Commands: made from their templates, run for their exit status or for their output.
 #pragma once
 
+#include <climits>
 #include <cstddef>
 #include <cstdio>
 #include <initializer_list>
@@ -12,6 +13,8 @@ namespace zav {
 // begins with '-' would be an option; such a command, and one that grows too long, is never run.
 class Command {
   public:
+    static constexpr size_t kSize = 2 * PATH_MAX + 1024; // room for two of the longest paths
+
     Command(const char *form, std::initializer_list<const char *> words);
 
     const char *text() const { return text_; }
@@ -24,10 +27,11 @@ class Command {
 
   private:
     void add(char character);
+    bool begins_a_word() const;
     void add_word(const char *word, bool in_backquotes);
     void add_quoted(char character, bool in_backquotes);
 
-    char text_[1024] = {}; // terminated wherever it ends
+    char text_[kSize] = {}; // terminated wherever it ends
     size_t length_ = 0;
     bool valid_ = true;
 };

@@ -11,6 +11,7 @@
 #include <filesystem>
 #include <fstream>
 #include <mutex>
+#include <pthread.h>
 #include <sstream>
 #include <sys/ioctl.h>
 #include <sys/mman.h>
@@ -87,6 +88,10 @@ Record &record() {
     return the_record;
 }
 
+bool is_drive_request(unsigned long request) {
+    return (request & ~0xFFUL) == 0x5300;
+}
+
 // What tests put into the root. The bare root itself comes with the directories.
 constexpr const char *kWipedDirectories[] = {
     "/etc/Kiru",        "/proc/zav",      "/proc/scsi",        "/sys/class",   "/dev/sata",
@@ -108,7 +113,15 @@ constexpr const char *kWipedFiles[] = {"/proc/mdstat",
                                        "/sbin/ethtool",
                                        "/proc/stat",
                                        "/proc/meminfo",
-                                       "/etc/mtab"};
+                                       "/etc/mtab",
+                                       "/proc/sys/dev/cdrom/info",
+                                       "/dev/scd0",
+                                       "/dev/cdrom",
+                                       "/tmp/progress.outfile",
+                                       "/tmp/dvd.outfile",
+                                       "/tmp/cd.outfile",
+                                       "/tmp/burnDir",
+                                       "/tmp/linkDir"};
 
 // The tests wipe directories of the system: never outside a private root.
 void require_private_root() {
@@ -302,12 +315,18 @@ int semop(int id, sembuf *operations, size_t count) {
     return harness::real<int(int, sembuf *, size_t)>("semop")(id, operations, count);
 }
 
-// The library asks the appliance's drivers alone, by small numbers. Others are a test's own.
+// The library asks the appliance's drivers, by small numbers, and the optical drive, by those of
+// CD-ROMs. Others are a test's own.
 int ioctl(int descriptor, unsigned long request, ...) noexcept {
     va_list arguments;
     va_start(arguments, request);
     void *argument = va_arg(arguments, void *);
     va_end(arguments);
+    if (harness::is_drive_request(request)) {
+        harness::record().requests.push_back(request);
+        errno = EIO;
+        return harness::record().drive ? harness::record().drive(request, argument) : -1;
+    }
     if (request > 0xFF)
         return static_cast<int>(syscall(SYS_ioctl, descriptor, request, argument));
     harness::record().requests.push_back(request);
@@ -315,6 +334,18 @@ int ioctl(int descriptor, unsigned long request, ...) noexcept {
         return harness::record().driver(request, argument);
     errno = EAGAIN;
     return -1;
+}
+
+int pthread_create(pthread_t *thread, const pthread_attr_t *attributes, void *(*body)(void *),
+                   void *argument) noexcept {
+    if (harness::record().thread_code) {
+        EXPECT_EQ(attributes, nullptr);
+        EXPECT_EQ(argument, nullptr);
+        harness::record().threads.push_back(body);
+        return *harness::record().thread_code;
+    }
+    return harness::real<int(pthread_t *, const pthread_attr_t *, void *(*)(void *), void *)>(
+        "pthread_create")(thread, attributes, body, argument);
 }
 
 int open(const char *path, int flags, ...) {

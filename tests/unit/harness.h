@@ -79,6 +79,9 @@ struct Record {
     std::vector<int> driver_flags; // with which a driver's device was opened
     std::vector<unsigned long> requests;
     std::function<int(unsigned long, void *)> driver; // answers requests; without it they fail
+    std::function<int(unsigned long, void *)> drive;  // the same for the optical drive
+    std::optional<int> thread_code; // what pthread_create answers instead of starting a thread
+    std::vector<void *(*)(void *)> threads; // that were to be started
     bool calloc_fails = false;
     bool fprintf_fails = false;
     bool munmap_fails = false;
