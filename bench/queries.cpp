@@ -52,6 +52,11 @@ void find_units(const char * /*they are these*/) {
     read_all("cat /etc/Kiru/zav/.raidinfo");
 }
 
+void read_port(const char * /*they are these*/) {
+    run("/sbin/ethtool eth0 > /dev/null  2>&1");
+    read_all("/sbin/ethtool eth0 2>&1");
+}
+
 // ---- The library's calls. ----
 
 void ask_disk() {
@@ -84,6 +89,14 @@ void ask_units() {
             "zavGetRBODSet");
 }
 
+void ask_port() {
+    zavDevice port = {ZAV_DEV_NIC, ZAV_MINDEV_NIC_ETH, 1, 0};
+    zavNetState info;
+    require(zavGetStateNic(&port, &info) == ZAV_RC_OK && info.state == ZAV_NET_UP &&
+                info.value == 1000,
+            "zavGetStateNic");
+}
+
 void count_disks() {
     int count = 0;
     require(get_diskcount(&count) == ZAV_RC_OK && count == 1, "get_diskcount");
@@ -106,6 +119,7 @@ const std::vector<Query> &queries() {
         {"zavGetStateRaid, software array", "/sbin/mdadm --detail /dev/md1", read_all, ask_array},
         {"zavgetStateLVMVG, one PV", "", read_group, ask_group},
         {"zavGetRBODSet, one unit", "", find_units, ask_units},
+        {"zavGetStateNic, Ethernet port", "", read_port, ask_port},
         {"get_diskcount", "cat /proc/scsi/scsi | grep \"Vendor: ATA\" | wc -l", read_all,
          count_disks},
         {"zavMapArcTimeZone",

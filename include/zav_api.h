@@ -1113,6 +1113,8 @@ void cdrom_reset(void);
  *  names no address for it. Nothing in the library calls it. */
 void rm_add_odd(void);
 
+struct cdrom_generic_command; /* linux/cdrom.h */
+
 /**
  * Sends one packet command to the open drive `fd`: fills the timeout, buffer, length and direction
  * (CGC_DATA_*) into `cgc`, whose command bytes are the caller's. Returns what the ioctl does, -1
@@ -1120,7 +1122,6 @@ void rm_add_odd(void);
  * byte 15 has its top bit set END THE CALLING PROCESS with status 0, after a line on standard
  * output.
  */
-struct cdrom_generic_command;
 int wait_cmd(int fd, struct cdrom_generic_command *cgc, void *buffer, int buflen, int ddir,
              int timeout, int quiet);
 
