@@ -2,6 +2,7 @@
 
 #include "model/enclosures.hpp"
 #include "model/factory.hpp"
+#include "model/network.hpp"
 #include "model/sentences.hpp"
 
 #include <CLI/CLI.hpp>
@@ -41,6 +42,14 @@ constexpr const char *footer =
     "  voltage N is 5.6 | latches | faults | recovers\n"
     "  fan N slows 700 | stops | recovers\n"
     "  input is 3F\n"
+    "  file system PATH fills 96%\n"
+    "  processor load 97%\n"
+    "  swap use 12%\n"
+    "  power fails | returns\n"
+    "  ups is silent | works again\n"
+    "  port N loses its link | gets its link | runs at 100\n"
+    "  bond fails over\n"
+    "  event fan N | thermal N | voltage N | ups | disk N | array N | port N\n"
     "  tool NAME hangs 30s | prints \"TEXT\" | exits N | is missing | works again";
 
 class HelpPage : public CLI::Formatter {
@@ -75,6 +84,9 @@ void declare(CLI::App &app, Options &options) {
     app.add_option("--hosts", options.hosts,
                    "Where sysfs has the disk controller's hosts: in its directory, or below ataN")
         ->check(CLI::IsMember({"direct", "ata"}))
+        ->capture_default_str();
+    app.add_option("--nics", options.nics, "Ethernet ports: none, two, or two in a bond")
+        ->check(CLI::IsMember(network_kinds()))
         ->capture_default_str();
     app.add_option("--time-scale", options.time_scale, "Appliance seconds per real second")
         ->check(CLI::Range(0.01, 100000.0))

@@ -21,6 +21,7 @@ struct Options {
     std::string tools = "appliance";
     std::string hosts = "direct";
     std::string shell = "bash";
+    std::string nics = "bond";
     std::string scenario;      // text of the scenario file, already checked
     std::string scenario_file; // its name, for messages
     double time_scale = 1.0;
@@ -33,7 +34,7 @@ struct Options {
 };
 
 NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(Options, model, product, serial, raidtype, level, tools, hosts,
-                                   shell, scenario, scenario_file, time_scale, units, bare,
+                                   shell, nics, scenario, scenario_file, time_scale, units, bare,
                                    has_shim, directory, program_directory, command)
 
 // The options as one word of a command line, and back. Their texts are bytes, not characters.

@@ -55,10 +55,22 @@ struct Action {
         fan_slows,
         fan_stops,
         fan_recovers,
-        input_is
+        input_is,
+        file_system_fills,
+        processor_load_is,
+        swap_use_is,
+        power_fails,
+        power_returns,
+        ups_is_silent,
+        ups_works,
+        port_loses_link,
+        port_gets_link,
+        port_runs,
+        bond_fails_over,
+        event_is_put
     };
     Kind kind = Kind::disk_fails;
-    int number = 0;   // disk, array, volume, sensor or fan, counted from 1
+    int number = 0;   // disk, array, volume, sensor, fan or port, counted from 1
     int unit = 0;     // expansion unit; 0 for the controller
     double value = 0; // of a reading
     int group = 0;    // of the volume; 0 is the system's

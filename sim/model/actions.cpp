@@ -4,7 +4,8 @@
 #include "model/contents.hpp"
 #include "model/controller_actions.hpp"
 #include "model/disks.hpp"
-#include "model/sensors.hpp"
+#include "model/driver_events.hpp"
+#include "model/health_actions.hpp"
 #include "model/sentences.hpp"
 #include "model/volumes.hpp"
 
@@ -229,9 +230,6 @@ bool is_about_array(Action::Kind kind) {
 bool is_about_volume(Action::Kind kind) {
     return kind > Action::Kind::array_stops && kind <= Action::Kind::volume_is_idle;
 }
-bool is_about_sensors(Action::Kind kind) {
-    return kind >= Action::Kind::temperature_is && kind <= Action::Kind::input_is;
-}
 // Where there is a RAID controller, the disks are its own.
 bool is_about_controller(const State &state, const Action &action) {
     return action.kind > Action::Kind::tool_works || action.unit != 0 ||
@@ -241,8 +239,8 @@ bool is_about_controller(const State &state, const Action &action) {
 } // namespace
 
 std::string perform(State &state, const Action &action) {
-    if (is_about_sensors(action.kind))
-        return act_on_sensors(state, action);
+    if (is_about_health(action.kind))
+        return act_on_health(state, action);
     if (is_about_controller(state, action))
         return act_on_controller(state, action);
     if (is_about_disk(action.kind))
@@ -258,6 +256,7 @@ std::string perform(State &state, const Action &action) {
 std::string perform_sentence(State &state, const std::string &sentence) {
     const Sentence parsed = parse_sentence(sentence);
     std::string problem = parsed.error.empty() ? perform(state, parsed.action) : parsed.error;
+    look_for_changes(state);
     state.notes.push_back(problem.empty() ? sentence : sentence + ": " + problem);
     return problem;
 }

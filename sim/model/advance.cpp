@@ -2,7 +2,9 @@
 
 #include "model/actions.hpp"
 #include "model/arrays.hpp"
+#include "model/driver_events.hpp"
 #include "model/enclosures.hpp"
+#include "model/ups.hpp"
 
 #include <algorithm>
 #include <limits>
@@ -62,6 +64,7 @@ double end_of_sync(const State &state, const Array &array) {
 
 double next_turn(const State &state, double now) {
     double turn = std::min(now, next_rebuild_end(state));
+    turn = std::min(turn, next_status(state));
     for (const Array &array : state.arrays)
         turn = std::min(turn, end_of_sync(state, array));
     if (!state.scenario.empty())
@@ -109,7 +112,9 @@ void advance(State &state, double now) {
     while (state.now < now) {
         copy_data(state, next_turn(state, now));
         play_due_events(state);
+        write_due_status(state);
         start_and_stop_syncs(state);
+        look_for_changes(state);
     }
 }
 

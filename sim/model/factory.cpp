@@ -2,8 +2,12 @@
 
 #include "model/arrays.hpp"
 #include "model/disks.hpp"
+#include "model/driver_events.hpp"
 #include "model/enclosures.hpp"
+#include "model/load.hpp"
+#include "model/network.hpp"
 #include "model/sensors.hpp"
+#include "model/ups.hpp"
 #include "model/volumes.hpp"
 
 #include <array>
@@ -126,6 +130,14 @@ void build_group(State &state, const FactoryGroup &plan) {
     }
 }
 
+void build_storage(State &state, const std::string &data_level) {
+    build_array(state, 1, "raid1");
+    build_array(state, 2, data_level);
+    build_array(state, 3, "raid1");
+    for (const FactoryGroup &group : factory_groups)
+        build_group(state, group);
+}
+
 } // namespace
 
 std::vector<std::string> model_names() {
@@ -182,6 +194,9 @@ State new_appliance(const Wishes &wishes) {
     state.hosts_below_ata = wishes.hosts_below_ata;
     state.sensors = new_sensors();
     state.registers = new_registers();
+    state.load = new_load();
+    state.ups = new_ups();
+    state.network = new_network(wishes.nics);
     const int disks = identity_of(wishes.model).disks;
     for (int slot = 1; slot <= disks; ++slot)
         state.disks.push_back(new_disk(state, slot));
@@ -194,13 +209,9 @@ State new_appliance(const Wishes &wishes) {
         static_cast<double>(component_of(2, level)) / data_rebuild_seconds;
     if (has_controller(wishes.model))
         state.controller = new_controller(state, wishes.units);
-    if (disks < 2)
-        return state;
-    build_array(state, 1, "raid1");
-    build_array(state, 2, level);
-    build_array(state, 3, "raid1");
-    for (const FactoryGroup &group : factory_groups)
-        build_group(state, group);
+    if (disks > 1)
+        build_storage(state, level);
+    know_everything(state);
     return state;
 }
 

@@ -19,7 +19,8 @@ struct Wishes {
     bool current_tools = false;
     double time_scale = 1;
     bool hosts_below_ata = false;
-    int units = 2; // expansion units of the model that has them
+    int units = 2;             // expansion units of the model that has them
+    std::string nics = "bond"; // ports: none, two, or a bond of two
 };
 
 std::vector<std::string> model_names();

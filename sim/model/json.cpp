@@ -68,11 +68,19 @@ NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(ToolFault, tool, hangs, prints, exits, missin
 NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(Event, at, sentence)
 NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(Probe, value, status, missing)
 NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(Sensors, temperatures, voltages, fans, input)
+NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(Load, processor, swap, file_systems, since, busy_before)
+NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(Ups, silent, on_battery, charge, since, status_at,
+                                   status_on_battery, status_charge, statuses, event_at,
+                                   event_state, event_charge, events)
+NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(Port, link, speed, failures)
+NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(Network, ports, bonded, active)
+NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(DriverEvent, kind, number, value, state)
 NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(State, model, data_level, current_tools, hosts_below_ata,
                                    time_scale, real_start, now, rebuild_kib_per_second, next_serial,
                                    next_sync_order, next_id, disks, arrays, stopped,
-                                   physical_volumes, groups, controller, sensors, registers, faults,
-                                   scenario, scsi_hosts, notes)
+                                   physical_volumes, groups, controller, sensors, registers, load,
+                                   ups, network, known_states, driver_events, faults, scenario,
+                                   scsi_hosts, notes)
 
 std::string to_text(const State &state) {
     // A garbled tool text may hold any bytes.

@@ -50,6 +50,7 @@ constexpr std::array<const char *, 18> gpio_lines = {"38", "39", "07", "23", "21
 template <typename Facts>
 std::vector<Probe> usual_probes(const Facts &facts) {
     std::vector<Probe> probes;
+    probes.reserve(facts.size());
     for (const ProbeFacts &each : facts)
         probes.push_back({each.usual, 0, false});
     return probes;
@@ -189,7 +190,7 @@ std::vector<DriverFile> writable_files(const State &state) {
     add_statuses(files, thermal_facts, state.sensors.temperatures);
     add_statuses(files, voltage_facts, state.sensors.voltages);
     for (const auto &[name, value] : state.registers)
-        files.push_back({driver + "dev/" + name, value + "\n"});
+        files.push_back({fmt::format("{}dev/{}", driver, name), value + "\n"});
     return files;
 }
 

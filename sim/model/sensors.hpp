@@ -21,6 +21,14 @@ Registers new_registers();
 // Answers why it could not be, or nothing.
 std::string act_on_sensors(State &state, const Action &action);
 
+// What the driver makes of them: readings, and states in the library's codes.
+double thermal_reading(const State &state, int number);
+double voltage_reading(const State &state, int number);
+double fan_speed(const State &state, int number);
+int thermal_condition(const State &state, int number);
+int voltage_condition(const State &state, int number);
+int fan_condition(const State &state, int number);
+
 // A file of the driver; without a text it is not there.
 struct DriverFile {
     std::string path;

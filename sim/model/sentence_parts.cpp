@@ -59,6 +59,12 @@ std::optional<int> whole_number(const std::string &text, int least, int most) {
     return number < least || number > most ? std::nullopt : std::optional(number);
 }
 
+std::optional<int> percentage(const std::string &text) {
+    return text.empty() || text.back() != '%'
+               ? std::nullopt
+               : whole_number(text.substr(0, text.size() - 1), 0, 100);
+}
+
 std::optional<double> duration(const std::string &text) {
     const std::size_t end = std::min(text.find_first_not_of("0123456789."), text.size());
     const std::string digits = text.substr(0, end);

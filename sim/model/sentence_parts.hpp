@@ -25,6 +25,9 @@ Words split(const std::string &text);
 
 std::optional<int> whole_number(const std::string &text, int least, int most);
 
+// 0% to 100%
+std::optional<int> percentage(const std::string &text);
+
 // 12, 12.5, with so many places behind the point at most.
 std::optional<double> decimal_number(const std::string &text, std::size_t places);
 
@@ -57,5 +60,15 @@ Sentence about_sensor(const std::vector<Word> &words);
 Sentence about_voltage(const std::vector<Word> &words);
 Sentence about_fan(const std::vector<Word> &words);
 Sentence about_input(const std::vector<Word> &words);
+
+// Sentences about load, UPS, network and events.
+Sentence about_file_system(const std::vector<Word> &words);
+Sentence about_processor(const std::vector<Word> &words);
+Sentence about_swap(const std::vector<Word> &words);
+Sentence about_power(const std::vector<Word> &words);
+Sentence about_ups(const std::vector<Word> &words);
+Sentence about_port(const std::vector<Word> &words);
+Sentence about_bond(const std::vector<Word> &words);
+Sentence about_event(const std::vector<Word> &words);
 
 } // namespace zavsim

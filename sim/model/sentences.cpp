@@ -37,12 +37,6 @@ bool read_volume_number(const std::string &text, Action &action) {
     return group && number;
 }
 
-std::optional<int> percentage(const std::string &text) {
-    return text.empty() || text.back() != '%'
-               ? std::nullopt
-               : whole_number(text.substr(0, text.size() - 1), 0, 100);
-}
-
 Sentence volume_state(Action action, const std::string &verb, const std::string &object) {
     static constexpr std::array<Verb, 4> states = {{{"active", Action::Kind::volume_is_active},
                                                     {"inactive", Action::Kind::volume_is_inactive},
@@ -112,7 +106,7 @@ struct Noun {
     Sentence (*read)(const std::vector<Word> &words);
 };
 
-constexpr std::array<Noun, 12> nouns = {{{"disk", about_disk},
+constexpr std::array<Noun, 20> nouns = {{{"disk", about_disk},
                                          {"array", about_array},
                                          {"volume", about_volume},
                                          {"controller", about_controller},
@@ -123,6 +117,14 @@ constexpr std::array<Noun, 12> nouns = {{{"disk", about_disk},
                                          {"voltage", about_voltage},
                                          {"fan", about_fan},
                                          {"input", about_input},
+                                         {"file", about_file_system},
+                                         {"processor", about_processor},
+                                         {"swap", about_swap},
+                                         {"power", about_power},
+                                         {"ups", about_ups},
+                                         {"port", about_port},
+                                         {"bond", about_bond},
+                                         {"event", about_event},
                                          {"tool", about_tool}}};
 
 std::string list_of_nouns() {
@@ -176,11 +178,11 @@ std::string quoted(const std::string &word) {
 
 const std::vector<std::string> &known_tools() {
     static const std::vector<std::string> tools = {
-        "mdadm",       "smartctl",  "mknod",       "vgs",         "lvs",      "pvs",
-        "vgdisplay",   "lvdisplay", "pvdisplay",   "vgcreate",    "vgextend", "vgremove",
-        "vgcfgbackup", "vgchange",  "lvcreate",    "lvremove",    "lvchange", "pvcreate",
-        "pvremove",    "udevinfo",  "sfdisk",      "dd",          "df",       "mount",
-        "umount",      "mkfs.ext4", "hbqSetup.sh", "query_sas.sh"};
+        "mdadm",       "smartctl",  "mknod",       "vgs",          "lvs",      "pvs",
+        "vgdisplay",   "lvdisplay", "pvdisplay",   "vgcreate",     "vgextend", "vgremove",
+        "vgcfgbackup", "vgchange",  "lvcreate",    "lvremove",     "lvchange", "pvcreate",
+        "pvremove",    "udevinfo",  "sfdisk",      "dd",           "df",       "mount",
+        "umount",      "mkfs.ext4", "hbqSetup.sh", "query_sas.sh", "ethtool"};
     return tools;
 }
 

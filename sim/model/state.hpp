@@ -5,6 +5,7 @@
 #include "model/health.hpp"
 
 #include <cstdint>
+#include <map>
 #include <optional>
 #include <string>
 #include <vector>
@@ -212,6 +213,11 @@ struct State {
     std::optional<Controller> controller;
     Sensors sensors;
     Registers registers;
+    Load load;
+    Ups ups;
+    Network network;
+    std::map<std::string, int> known_states; // that the driver last saw, by kind and number
+    std::vector<DriverEvent> driver_events;  // that are not in the driver's queue yet
     std::vector<ToolFault> faults;
     std::vector<Event> scenario; // what is still to come, soonest first
     std::vector<int> scsi_hosts; // hosts with a device, in the order in which the kernel found them

@@ -1,6 +1,7 @@
 #include "model/arrays.hpp"
 #include "model/devices.hpp"
 #include "model/disks.hpp"
+#include "model/load.hpp"
 #include "model/texts_volumes.hpp"
 #include "model/volumes.hpp"
 
@@ -127,10 +128,9 @@ std::string table_dump(const Disk &disk, const std::string &shown_name) {
 }
 
 std::string mtab_text(const State &state) {
-    std::string text = "tmpfs / tmpfs rw,relatime 0 0\n"
-                       "proc /proc proc rw,relatime 0 0\n"
-                       "sysfs /sys sysfs rw,relatime 0 0\n"
-                       "tmpfs /tmp tmpfs rw,relatime 0 0\n";
+    std::string text = "proc /proc proc rw,relatime 0 0\n"
+                       "sysfs /sys sysfs rw,relatime 0 0\n";
+    text.insert(0, own_mounts_text());
     for (const Mounted &mounted : mounted_volumes(state))
         text += fmt::format("{} {} ext4 rw,relatime{} 0 0\n",
                             mapper_path(*mounted.group, *mounted.volume),
@@ -162,7 +162,7 @@ std::string file_systems_text(const State &state) {
         text += fmt::format("{} 1024 {} {} {}\n", mounted.volume->mount_point, system.kib,
                             system.kib - system.used_kib, available_kib(system));
     }
-    return text;
+    return text + own_usage_text(state);
 }
 
 } // namespace zavsim

@@ -2,10 +2,13 @@
 
 #include "launcher/sandbox.hpp"
 #include "model/devices.hpp"
+#include "model/load.hpp"
+#include "model/network.hpp"
 #include "model/texts.hpp"
 #include "model/texts_volumes.hpp"
 #include "root/files.hpp"
 #include "root/report.hpp"
+#include "root/ups_files.hpp"
 #include "tools/tools.hpp"
 
 #include <filesystem>
@@ -141,6 +144,8 @@ void publish_ports(const State &state) {
 
 // A program may write its own mtab; it is replaced when a mount changes.
 void publish_mounts(const State &state) {
+    for (const std::string &path : own_file_systems())
+        fs::create_directories(path);
     for (const Group &group : state.groups)
         for (const Volume &volume : group.volumes)
             if (!volume.mount_point.empty())
@@ -152,6 +157,17 @@ void publish_mounts(const State &state) {
         write_text("/etc/mtab", mtab);
     }
     write_text(place::run + "/file-systems", file_systems_text(state));
+}
+
+void publish_load(const State &state) {
+    write_text("/proc/stat", stat_text(state));
+    write_text("/proc/meminfo", meminfo_text(state));
+}
+
+void publish_network(const State &state) {
+    const std::string text = bonding_text(state.network);
+    if (!text.empty())
+        write_text("/proc/net/bonding/bond0", text);
 }
 
 bool is_missing(const State &state, const std::string &tool) {
@@ -200,6 +216,9 @@ bool publish(const State &state, const Taken &taken) {
     publish_mounts(state);
     publish_tools(state);
     publish_driver_files(state, taken.driver_files);
+    publish_load(state);
+    publish_ups(state);
+    publish_network(state);
     const bool shown = publish_report(state);
     // The last: who waits for a command to be done looks for the list in its place.
     publish_scsi(scsi_text(state), taken.scsi_command);

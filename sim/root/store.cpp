@@ -3,10 +3,12 @@
 #include "launcher/sandbox.hpp"
 #include "model/actions.hpp"
 #include "model/advance.hpp"
+#include "model/driver_events.hpp"
 #include "model/factory.hpp"
 #include "model/json.hpp"
 #include "model/sentences.hpp"
 #include "root/clock.hpp"
+#include "root/driver_queue.hpp"
 
 #include <cerrno>
 #include <fcntl.h>
@@ -52,13 +54,16 @@ Turn::Turn() : lock_(open_locked()), state_(load()) {
 }
 
 bool Turn::commit() {
+    look_for_changes(state_);
+    hand_over_events(state_);
     write_text(state_file, to_text(state_));
     return publish(state_, taken_);
 }
 
 void start_model(const Options &options) {
-    State state = new_appliance({options.model, options.level, options.tools == "current",
-                                 options.time_scale, options.hosts == "ata", options.units});
+    State state =
+        new_appliance({options.model, options.level, options.tools == "current", options.time_scale,
+                       options.hosts == "ata", options.units, options.nics});
     state.real_start = machine_seconds();
     state.scenario = parse_scenario(options.scenario, options.scenario_file).events;
     write_text(state_file, to_text(state));

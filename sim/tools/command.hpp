@@ -39,6 +39,7 @@ int run_sfdisk(const std::vector<std::string> &words);
 int run_dd(const std::vector<std::string> &words);
 int run_setup_script(const std::vector<std::string> &words);
 int run_query_sas(const std::vector<std::string> &words);
+int run_ethtool(const std::vector<std::string> &words);
 
 int run_act(const std::vector<std::string> &words);
 int run_state(const std::vector<std::string> &words);

@@ -79,7 +79,8 @@ const std::vector<Tool> &simulated_tools() {
         {"umount", "/usr/bin/umount", run_umount},
         {"mkfs.ext4", "/usr/sbin/mkfs.ext4", run_mkfs},
         {"hbqSetup.sh", "/usr/bin/hbqSetup.sh", run_setup_script},
-        {"query_sas.sh", "/usr/bin/query_sas.sh", run_query_sas}};
+        {"query_sas.sh", "/usr/bin/query_sas.sh", run_query_sas},
+        {"ethtool", "/usr/sbin/ethtool", run_ethtool}};
     return tools;
 }
 

@@ -59,12 +59,50 @@ int leds() {
     return 0;
 }
 
+// The processor is measured over ten seconds.
+int load() {
+    constexpr int probes[] = {0x101, 0x102, 0x103, 0x105, 0x106, 0x107};
+    for (const int probe : probes) {
+        zavSysinfoState info = {};
+        const int rc = zavGetStateSysinfo(probe, &info);
+        printf("load %x: %d %.0f %x\n", static_cast<unsigned>(probe), rc,
+               static_cast<double>(info.value), static_cast<unsigned>(info.state));
+    }
+    float usage = 0;
+    const int rc = fsinfo(2, &usage);
+    printf("/etc/Kiru: %d %.0f\n", rc, static_cast<double>(usage));
+    return 0;
+}
+
+int ups() {
+    zavUpsState info = {};
+    const int rc = zavGetStateUPS(&info);
+    printf("ups: %d %.1f %d\n", rc, static_cast<double>(info.charge), info.state);
+    return 0;
+}
+
+void print_port(const char *name, int minor_type, int number) {
+    zavDevice dev = {ZAV_DEV_NIC, minor_type, number, 0};
+    zavNetState info = {};
+    const int rc = zavGetStateNic(&dev, &info);
+    printf("%s: %d %d %d\n", name, rc, info.value, info.state);
+}
+
+int network() {
+    print_port("eth0", ZAV_MINDEV_NIC_ETH, 1);
+    print_port("eth1", ZAV_MINDEV_NIC_ETH, 2);
+    print_port("eth2", ZAV_MINDEV_NIC_ETH, 3);
+    print_port("bond0", ZAV_MINDEV_NIC_BOND, 1);
+    return 0;
+}
+
 struct Task {
     const char *word;
     int (*run)();
 };
 
-constexpr Task tasks[] = {{"sensors", sensors}, {"reset", reset}, {"leds", leds}};
+constexpr Task tasks[] = {{"sensors", sensors}, {"reset", reset}, {"leds", leds},
+                          {"load", load},       {"ups", ups},     {"network", network}};
 
 } // namespace
 
