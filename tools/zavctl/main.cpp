@@ -37,6 +37,8 @@ std::string rendered(const Answer &answer, const Session &session) {
 }
 
 int run_action(const Streams &streams, const Session &session) {
+    if (session.program)
+        return session.program();
     const Answer answer = session.action();
     return written(streams, rendered(answer, session), exit_status(severity(answer)));
 }

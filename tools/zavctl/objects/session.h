@@ -24,6 +24,7 @@ struct Session {
     const Streams &streams;
     Options options;
     std::function<Answer()> action; // set by the verb that was chosen
+    std::function<int()> program;   // in place of an action: writes by itself, exit status
     bool abandoned = false;         // a thread still waits for a tool
 
     explicit Session(const Streams &own_streams) : streams(own_streams) {}

@@ -3,8 +3,11 @@
 #include "run.h"
 
 #include <atomic>
+#include <condition_variable>
 #include <csignal>
+#include <cstring>
 #include <initializer_list>
+#include <mutex>
 #include <thread>
 #include <unistd.h>
 
@@ -16,14 +19,36 @@ std::atomic<bool> ending = false;
 std::atomic<bool> changing = false;
 std::atomic<int> told = -1; // where to tell that a change is finished first
 
+// What a running program is told of an interrupt. Never destroyed: the thread that waits for
+// signals outlives main.
+struct Stop {
+    std::mutex mutex;
+    std::condition_variable noted;
+    bool running = false; // a StopGuard lives
+    bool asked = false;
+    int descriptor = -1;
+    const char *farewell = "";
+};
+Stop &stop() {
+    static Stop *const one = new Stop;
+    return *one;
+}
+
 bool is_ignored(int number) {
     struct sigaction action {};
     return sigaction(number, nullptr, &action) == 0 && action.sa_handler == SIG_IGN;
 }
 
+void say_farewell() {
+    const std::lock_guard lock(stop().mutex);
+    if (stop().running) [[maybe_unused]]
+        const auto done = write(stop().descriptor, stop().farewell, std::strlen(stop().farewell));
+}
+
 // Ends like a program that has no handler for the signal, so that a calling shell stops too.
 [[noreturn]] void end_by(int number) {
     ending = true;
+    say_farewell();
     kill_descendants();
     if (isatty(STDERR_FILENO) == 1) {
         constexpr char erase_line[] = "\r\033[K";
@@ -48,6 +73,16 @@ bool change_goes_on() {
     return true;
 }
 
+// True if a program runs until it is asked to stop, and this is the first time.
+bool stops_by_itself() {
+    const std::lock_guard lock(stop().mutex);
+    if (!stop().running || stop().asked)
+        return false;
+    stop().asked = true;
+    stop().noted.notify_all();
+    return true;
+}
+
 } // namespace
 
 void end_on_interrupt() {
@@ -60,7 +95,7 @@ void end_on_interrupt() {
     std::thread([set] {
         int number = 0;
         while (sigwait(&set, &number) == 0)
-            if (!change_goes_on())
+            if (!change_goes_on() && !stops_by_itself())
                 end_by(number);
     }).detach();
 }
@@ -77,6 +112,28 @@ ChangeGuard::ChangeGuard(int tell) {
 
 ChangeGuard::~ChangeGuard() {
     changing = false;
+}
+
+StopGuard::StopGuard(int descriptor, const char *farewell) {
+    const std::lock_guard lock(stop().mutex);
+    stop().running = true;
+    stop().descriptor = descriptor;
+    stop().farewell = farewell;
+}
+
+StopGuard::~StopGuard() {
+    const std::lock_guard lock(stop().mutex);
+    stop().running = false;
+}
+
+bool stop_asked() {
+    const std::lock_guard lock(stop().mutex);
+    return stop().asked;
+}
+
+bool stop_within(std::chrono::milliseconds time) {
+    std::unique_lock lock(stop().mutex);
+    return stop().noted.wait_for(lock, time, [] { return stop().asked; });
 }
 
 } // namespace zavctl

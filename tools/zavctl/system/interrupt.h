@@ -1,6 +1,8 @@
 // Ctrl-C while a tool runs.
 #pragma once
 
+#include <chrono>
+
 namespace zavctl {
 
 // From here on an interrupt or a request to end ends this process with the tools that it has
@@ -22,5 +24,22 @@ class ChangeGuard {
     ChangeGuard(const ChangeGuard &) = delete;
     ChangeGuard &operator=(const ChangeGuard &) = delete;
 };
+
+// While one of these lives, the program runs until it is asked to stop: the first interrupt is
+// noted, so that what has begun is written, and a second one ends the process as ever, with
+// `farewell` written to the descriptor before (what leaves the screen as it was).
+class StopGuard {
+  public:
+    explicit StopGuard(int descriptor = -1, const char *farewell = "");
+    ~StopGuard();
+    StopGuard(const StopGuard &) = delete;
+    StopGuard &operator=(const StopGuard &) = delete;
+};
+
+// Whether an interrupt was noted.
+bool stop_asked();
+
+// Waits for so long, or until an interrupt is noted: true then.
+bool stop_within(std::chrono::milliseconds time);
 
 } // namespace zavctl

@@ -9,6 +9,7 @@
 #include <cstdlib>
 #include <cstring>
 #include <fcntl.h>
+#include <poll.h>
 #include <string_view>
 #include <unistd.h>
 
@@ -49,11 +50,12 @@ bool terminal_is_dumb() {
     return term == nullptr || std::string_view(term) == "dumb";
 }
 
-std::size_t terminal_width(int descriptor) {
+// Columns and rows; 0 of what is no terminal.
+winsize terminal_size(int descriptor) {
     winsize size{};
     if (ioctl(descriptor, TIOCGWINSZ, &size) != 0)
-        return 0;
-    return size.ws_col;
+        return {};
+    return size;
 }
 
 // By the name of the locale alone: it may not be installed, and still be what the terminal shows.
@@ -98,6 +100,15 @@ int Streams::write(const std::string &text) const {
     return write_all(out_, text);
 }
 
+bool Streams::reader_gone() const {
+    pollfd watched{out_, 0, 0};
+    return poll(&watched, 1, 0) > 0 && (watched.revents & (POLLERR | POLLHUP | POLLNVAL)) != 0;
+}
+
+std::size_t Streams::height() const {
+    return out_is_terminal() ? terminal_size(out_).ws_row : 0;
+}
+
 void Streams::say(const std::string &text) const {
     write_all(err_, text); // nobody could be told of a failure
 }
@@ -132,7 +143,7 @@ Style Streams::style(const std::string &when) const {
     Style style;
     const bool wanted = out_is_terminal() && !environment_says("NO_COLOR") && !terminal_is_dumb();
     style.colour = when == "always" || (when == "auto" && wanted);
-    style.width = out_is_terminal() ? terminal_width(out_) : 0;
+    style.width = out_is_terminal() ? terminal_size(out_).ws_col : 0;
     style.unicode = characters_are_utf8();
     return style;
 }
@@ -140,7 +151,7 @@ Style Streams::style(const std::string &when) const {
 Style Streams::message_style() const {
     Style style;
     style.colour = err_is_terminal() && !environment_says("NO_COLOR") && !terminal_is_dumb();
-    style.width = err_is_terminal() ? terminal_width(err_) : 0;
+    style.width = err_is_terminal() ? terminal_size(err_).ws_col : 0;
     return style;
 }
 

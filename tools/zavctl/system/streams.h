@@ -18,6 +18,15 @@ class Streams {
     // Writes the whole text to the real standard output. 0, or errno of the failure.
     int write(const std::string &text) const;
 
+    // Whether whoever reads standard output has gone: nothing written would be read.
+    bool reader_gone() const;
+
+    // The real standard output, whatever descriptor 1 has become meanwhile.
+    int out() const { return out_; }
+
+    // Lines of the terminal at standard output; 0 if it is none.
+    std::size_t height() const;
+
     // A message for the person at the terminal, on standard error.
     void say(const std::string &text) const;
 

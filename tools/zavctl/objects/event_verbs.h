@@ -1,0 +1,13 @@
+#pragma once
+
+#include "objects.h"
+
+namespace zavctl {
+
+// The verb that goes on until it is stopped.
+void add_event_follow(CLI::App &event, Session &session);
+
+// The option for the driver's other queue.
+void add_private(CLI::App &verb, bool &is_private);
+
+} // namespace zavctl
