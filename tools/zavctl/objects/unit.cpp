@@ -1,5 +1,6 @@
 #include "asking.h"
 #include "cascade.h"
+#include "unit_verbs.h"
 
 #include "../core/raid_set.h"
 #include "../core/unit_tree.h"
@@ -34,27 +35,11 @@ constexpr VerbHelp show_help = {
     "  zavctl unit show 1 2 --json",
 };
 
-// False for a model that is not known, which may have units or not.
-bool may_have_units(const Machine &machine) {
-    if (machine.model.known() && !machine.model.hardware_raid())
-        throw UsageError(fmt::format("this model ({}) has no expansion units: they hang behind "
-                                     "the RAID controller of model 2980",
-                                     model_name(machine.model)));
-    return machine.model.known();
-}
-
 Answer answer_of(const char *command, const CascadeReport &cascade, Section section) {
     Section own;
     own.key = "controller";
     own.records = controller_json(cascade);
     return {command, "", {std::move(own), std::move(section)}};
-}
-
-Answer unknown_model(const char *command, const Machine &machine) {
-    Section section;
-    section.key = "units";
-    section.findings = model_findings(machine.model);
-    return {command, "", {std::move(section)}};
 }
 
 Answer list(Session &session) {
@@ -95,11 +80,28 @@ Answer show(Session &session, const std::vector<int> &numbers) {
 
 } // namespace
 
+bool may_have_units(const Machine &machine) {
+    if (machine.model.known() && !machine.model.hardware_raid())
+        throw UsageError(fmt::format("this model ({}) has no expansion units: they hang behind "
+                                     "the RAID controller of model 2980",
+                                     model_name(machine.model)));
+    return machine.model.known();
+}
+
+Answer unknown_model(const char *command, const Machine &machine) {
+    Section section;
+    section.key = "units";
+    section.findings = model_findings(machine.model);
+    return {command, "", {std::move(section)}};
+}
+
 void add_unit(CLI::App &root, Session &session) {
-    CLI::App *unit = add_object(root, "unit", "The expansion units: list, show");
+    CLI::App *unit = add_object(root, "unit", "The expansion units: list, show, check, mark");
     add_list(*unit, session, list_help, list);
     add_show<int>(*unit, session, show_help, {"N", "Number of the unit, 1 to 7"}, show)
         ->check(CLI::Range(1, last_unit));
+    add_unit_check(*unit, session);
+    add_unit_mark(*unit, session);
 }
 
 } // namespace zavctl
