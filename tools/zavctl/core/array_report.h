@@ -34,6 +34,7 @@ struct ArrayReport {
     std::string doubt;       // why the answer cannot be trusted, "" if it can
     std::string kernel_says; // the array's lines in /proc/mdstat, "" if there are none
     std::string refusal;     // what in those lines the library does not take, "" if nothing
+    std::optional<zavSystemEvent> record{}; // as the library answered it
     std::optional<Failure> failure;
 };
 

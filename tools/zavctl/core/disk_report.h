@@ -22,6 +22,7 @@ struct DiskReport {
     double size = 0;           // as the RAID controller's report gives it, 0 if not told
     std::string raid_set;      // its name, "" if not told
     std::string doubt;         // why the answer cannot be trusted, "" if it can
+    std::optional<zavSystemEvent> record{}; // as the library answered it
     std::optional<Failure> failure;
 };
 

@@ -24,6 +24,7 @@ struct GroupReport {
     std::vector<int> pvs;         // numbers of its physical volumes, likewise
     bool expected = false;        // this machine should have it
     std::string doubt;            // why the answer cannot be trusted, "" if it can
+    std::optional<zavSystemEvent> record{}; // as the library answered it
     std::optional<Failure> failure;
 
     // Whether the group answered, so that what it consists of is known.

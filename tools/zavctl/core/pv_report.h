@@ -13,6 +13,7 @@ struct PvReport {
     std::uint64_t size = 0; // as the library gives it, see shown_size(); 0 if not told
     Address device;         // the disk or array under it; disk 0 if that has no address
     std::string doubt;      // why the answer cannot be trusted, "" if it can
+    std::optional<zavSystemEvent> record{}; // as the library answered it
     std::optional<Failure> failure;
 };
 

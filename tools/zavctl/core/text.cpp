@@ -5,6 +5,7 @@
 #include <fmt/format.h>
 
 #include <algorithm>
+#include <iterator>
 #include <utility>
 
 namespace zavctl {
@@ -119,6 +120,24 @@ std::string coloured(std::string_view text, Severity severity, const Style &styl
     return sequence(colour_code(severity), text, style);
 }
 
+std::string cut(std::string_view line, std::size_t width) {
+    constexpr char escape = '\033';
+    std::string result;
+    std::size_t used = 0;
+    while (!line.empty()) {
+        const bool sequence = line[0] == escape;
+        const std::size_t end = line.find('m');
+        const std::size_t length = !sequence                       ? first_char(line).length
+                                   : end == std::string_view::npos ? line.size()
+                                                                   : end + 1;
+        if (sequence || width == 0 || used < width)
+            result += line.substr(0, length);
+        used += sequence ? 0 : 1;
+        line.remove_prefix(length);
+    }
+    return result;
+}
+
 std::string mark(Severity severity) {
     switch (severity) {
     case Severity::ok:
@@ -191,7 +210,8 @@ void Table::write_row(std::string &out, const Row &row, const std::vector<std::s
     const std::size_t last = headings_.size() - 1;
     const std::size_t start = column_start(widths, last);
     const std::vector<std::string> lines = wrapped(row.cells[last], room(style, start));
-    out += " " + coloured(mark(row.severity), row.severity, style) + "  ";
+    out += row.changed ? bold("*", style) : " ";
+    out += coloured(mark(row.severity), row.severity, style) + "  ";
     for (std::size_t i = 0; i <= last; ++i) {
         const std::string text = i == last ? lines[0] : row.cells[i];
         const std::string cell = i == 0 ? drawn(row.branches, style) + text : text;
@@ -224,6 +244,24 @@ std::string Table::text(const Style &style) const {
     for (const Row &row : rows_)
         write_row(out, row, widths, style);
     return out;
+}
+
+void Table::star_changes(const Table &before) {
+    for (Row &row : rows_) {
+        const auto old =
+            std::find_if(before.rows_.begin(), before.rows_.end(), [&row](const Row &other) {
+                return other.cells.front() == row.cells.front();
+            });
+        row.changed = old == before.rows_.end() || old->severity != row.severity ||
+                      old->cells[state_column_] != row.cells[state_column_];
+    }
+}
+
+Table Table::unwell() const {
+    Table table(headings_, state_column_);
+    std::copy_if(rows_.begin(), rows_.end(), std::back_inserter(table.rows_),
+                 [](const Row &row) { return row.severity != Severity::ok; });
+    return table.rows_.empty() ? Table() : table;
 }
 
 void Details::add_lines(const std::string &name, std::string_view lines) {

@@ -32,6 +32,10 @@ std::size_t columns(std::string_view text);
 std::string bold(std::string_view text, const Style &style);
 std::string coloured(std::string_view text, Severity severity, const Style &style);
 
+// The beginning of a line that may hold sequences for colours, as far as it fits `width` columns;
+// 0 is no limit.
+std::string cut(std::string_view line, std::size_t width);
+
 // The one-letter mark at the start of a row: blank ok, ! warning, ? unknown, X critical.
 std::string mark(Severity severity);
 
@@ -65,6 +69,7 @@ class Table {
         std::vector<std::string> cells;
         std::string below;              // a line of its own under the last column, "" for none
         std::vector<Branch> branches{}; // of the tree that leads to the row, drawn before its text
+        bool changed = false;           // has a star before its mark
     };
 
     Table() = default;
@@ -80,6 +85,13 @@ class Table {
     }
     bool empty() const { return headings_.empty(); }
     std::string text(const Style &style) const;
+
+    // Stars the rows that an older table does not have with the same severity and state. Rows are
+    // told apart by their first cell.
+    void star_changes(const Table &before);
+
+    // The rows that are not well.
+    Table unwell() const;
 
   private:
     std::vector<std::size_t> widths() const;

@@ -15,7 +15,8 @@ namespace zavctl {
 // Temperature or voltage of a unit's processor.
 struct UnitSensor {
     double value = 0;
-    int state = 0; // ZAV_RBOD_*
+    int state = 0;                          // ZAV_RBOD_*
+    std::optional<zavSystemEvent> record{}; // as the library answered it
     std::optional<Failure> failure;
     std::string doubt; // why the answer cannot be trusted, "" if it can
 };

@@ -66,6 +66,9 @@ Section common_section(const CascadeReport &cascade) {
     section.findings = cascade_findings(cascade);
     for (const UnitReport &unit : cascade.units) {
         section.records.push_back(unit_json(unit));
+        for (const UnitSensor *sensor : {&unit.temperature, &unit.voltage})
+            if (sensor->record)
+                section.events.push_back(*sensor->record);
         const std::vector<Finding> findings = unit_findings(unit);
         section.findings.insert(section.findings.end(), findings.begin(), findings.end());
     }

@@ -28,6 +28,9 @@ Section section_of(const std::string &key, const std::vector<Report> &reports,
     section.key = key;
     for (const Report &report : reports) {
         section.records.push_back(record(report));
+        if constexpr (requires { report.record; })
+            if (report.record)
+                section.events.push_back(*report.record);
         if (severity(report) != Severity::ok)
             section.findings.push_back(finding(report));
     }

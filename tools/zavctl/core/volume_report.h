@@ -25,6 +25,7 @@ struct VolumeReport {
     std::string mount_point; // where it belongs
     bool mounted = false;    // something is mounted there
     std::string doubt;       // why the answer cannot be trusted, "" if it can
+    std::optional<zavSystemEvent> record{}; // as the library answered it
     std::optional<Failure> failure;
 };
 

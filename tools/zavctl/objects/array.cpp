@@ -1,6 +1,7 @@
 #include "asking.h"
 #include "surveys.h"
 
+#include "../core/event.h"
 #include "../core/mdstat.h"
 #include "../core/raid_set.h"
 #include "../system/files.h"
@@ -139,6 +140,7 @@ void add_enclosure(ArrayReport &array) {
 ArrayReport answered(ArrayReport array, const std::string &tool_missing) {
     const library::RaidAnswer answer = library::raid_state(array.address.device);
     array.failure = library::failure_of(answer.result);
+    array.record = answered_event(answer.result, answer.state);
     array.state = answer.state.state;
     array.level = answer.state.raidlevel;
     array.resync = static_cast<double>(answer.state.resync);

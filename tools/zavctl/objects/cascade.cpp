@@ -1,5 +1,6 @@
 #include "cascade.h"
 
+#include "../core/event.h"
 #include "../core/raid_set.h"
 #include "../core/report_check.h"
 #include "../core/slot_id.h"
@@ -103,6 +104,7 @@ UnitSensor asked_sensor(int unit, int id) {
     sensor.state = answer.state.state;
     sensor.value = as_written(answer.state.value).value_or(0);
     sensor.failure = library::failure_of(answer.result);
+    sensor.record = answered_event(answer.result, answer.state);
     if (sensor.failure && sensor.failure->code == ZAV_RC_ERR_ENODEV)
         sensor.failure->meaning = "the RAID controller's report has no section of this unit";
     if (sensor.failure && sensor.failure->code == ZAV_RC_ERR_ENOENT)

@@ -2,6 +2,7 @@
 #include "disk_verbs.h"
 #include "surveys.h"
 
+#include "../core/event.h"
 #include "../core/raid_set.h"
 #include "../system/library.h"
 
@@ -92,6 +93,7 @@ DiskReport answered(DiskReport disk) {
     const library::DiskAnswer answer = library::disk_state(disk.address.device);
     disk.state = answer.state.state;
     disk.failure = library::failure_of(answer.result);
+    disk.record = answered_event(answer.result, answer.state);
     disk.node_present = node_exists(disk.address);
     if (is_reported(disk)) {
         const library::SetAnswer enclosure = library::raid_set(disk.address.device);

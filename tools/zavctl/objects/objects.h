@@ -49,6 +49,7 @@ void add_lv(CLI::App &root, Session &session);
 void add_bios(CLI::App &root, Session &session);
 void add_name(CLI::App &root, Session &session);
 void add_event(CLI::App &root, Session &session);
+void add_watch(CLI::App &root, Session &session);
 void add_doctor(CLI::App &root, Session &session);
 
 } // namespace zavctl

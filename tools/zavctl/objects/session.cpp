@@ -17,6 +17,7 @@ constexpr const char *exit_statuses = "Exit status:\n"
 void Session::ask(const std::vector<Question> &questions) {
     Patience patience;
     patience.limit = std::chrono::seconds(options.timeout);
+    patience.repeated = repeated;
     if (!ask_all(questions, patience, streams))
         abandoned = true;
 }

@@ -25,6 +25,7 @@ struct Session {
     Options options;
     std::function<Answer()> action; // set by the verb that was chosen
     std::function<int()> program;   // in place of an action: writes by itself, exit status
+    bool repeated = false;          // the same is asked again and again, see Patience
     bool abandoned = false;         // a thread still waits for a tool
 
     explicit Session(const Streams &own_streams) : streams(own_streams) {}

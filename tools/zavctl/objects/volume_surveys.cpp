@@ -2,6 +2,7 @@
 
 #include "asking.h"
 
+#include "../core/event.h"
 #include "../system/files.h"
 #include "../system/library.h"
 #include "../system/run.h"
@@ -63,6 +64,7 @@ void add_parts(GroupReport &group, const lvmVG &record) {
 GroupReport answered(GroupReport group, const std::string &tool_missing) {
     const library::VolumeAnswer answer = library::volume_state(group.address.device);
     group.failure = library::failure_of(answer.result);
+    group.record = answered_event(answer.result, answer.state);
     group.state = answer.state.state;
     explain(group.failure, tool_missing);
     if ((group.state & ZAV_LVM_NORMAL) != 0)
@@ -87,6 +89,7 @@ VolumeReport unanswered_volume(const Machine &machine, const VolumeId &id, const
 VolumeReport answered(VolumeReport volume, const std::string &tool_missing) {
     const library::VolumeAnswer answer = library::volume_state(volume.address.device);
     volume.failure = library::failure_of(answer.result);
+    volume.record = answered_event(answer.result, answer.state);
     volume.state = answer.state.state;
     volume.size = answer.state.dev.lvmlvdev.size;
     volume.usage = static_cast<double>(answer.state.dev.lvmlvdev.usage);
@@ -108,6 +111,7 @@ PvReport answered(PvReport pv, const std::string &tool_missing) {
     const library::VolumeAnswer answer = library::volume_state(pv.address.device);
     const lvmPV &record = answer.state.dev.lvmpvdev;
     pv.failure = library::failure_of(answer.result);
+    pv.record = answered_event(answer.result, answer.state);
     pv.state = answer.state.state;
     pv.size = record.size;
     pv.device = library::address_of(record.dev);

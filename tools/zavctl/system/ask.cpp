@@ -1,6 +1,7 @@
 #include "ask.h"
 
 #include "../core/text.h"
+#include "interrupt.h"
 #include "run.h"
 #include "streams.h"
 
@@ -8,9 +9,11 @@
 
 #include <algorithm>
 #include <condition_variable>
+#include <iterator>
 #include <memory>
 #include <mutex>
 #include <optional>
+#include <set>
 #include <system_error>
 #include <thread>
 
@@ -29,12 +32,41 @@ struct Board {
     std::mutex mutex;
     std::condition_variable changed;
     std::vector<std::optional<Delivery>> answers;
+    bool closed = false; // nobody waits any more
 };
+
+// What the threads that were left behind ask about. Never destroyed: they may outlive main.
+class LeftBehind {
+  public:
+    void add(const std::string &about) {
+        const std::lock_guard lock(mutex_);
+        about_.insert(about);
+    }
+    void remove(const std::string &about) {
+        const std::lock_guard lock(mutex_);
+        about_.erase(about);
+    }
+    bool has(const std::string &about) {
+        const std::lock_guard lock(mutex_);
+        return about_.count(about) > 0;
+    }
+
+  private:
+    std::mutex mutex_;
+    std::set<std::string> about_;
+};
+
+LeftBehind &left_behind() {
+    static LeftBehind *const one = new LeftBehind;
+    return *one;
+}
 
 void answer(const std::shared_ptr<Board> &board, std::size_t index, const Question &question) {
     Delivery delivery = question.ask();
     const std::lock_guard lock(board->mutex);
     board->answers[index] = std::move(delivery);
+    if (board->closed)
+        left_behind().remove(question.about);
     board->changed.notify_all();
 }
 
@@ -57,8 +89,8 @@ std::vector<std::string> unanswered(const Board &board, const std::vector<Questi
 // A line on the terminal that replaces itself and leaves nothing behind.
 class Notice {
   public:
-    explicit Notice(const Streams &streams)
-        : streams_(streams), enabled_(streams.err_is_terminal()) {}
+    Notice(const Streams &streams, bool enabled)
+        : streams_(streams), enabled_(enabled && streams.err_is_terminal()) {}
     ~Notice() {
         if (shown_)
             streams_.say("\r\033[K");
@@ -88,13 +120,22 @@ bool wait_for_answers(Board &board, const std::vector<Question> &questions,
         const auto waited = Clock::now() - begin;
         if (about.empty())
             return true;
-        if (waited >= patience.limit)
+        if (waited >= patience.limit || stop_asked())
             return false;
         if (waited >= silence)
             notice.show(waiting_line(
                 about, std::chrono::duration_cast<std::chrono::seconds>(waited), patience));
         board.changed.wait_for(lock, refresh);
     }
+}
+
+std::vector<Question> to_be_asked(const std::vector<Question> &all, const Patience &patience) {
+    std::vector<Question> questions;
+    std::copy_if(all.begin(), all.end(), std::back_inserter(questions),
+                 [&patience](const Question &question) {
+                     return !patience.repeated || !left_behind().has(question.about);
+                 });
+    return questions;
 }
 
 } // namespace
@@ -113,21 +154,25 @@ std::string waiting_line(const std::vector<std::string> &about, std::chrono::sec
                        waited.count(), patience.limit.count());
 }
 
-bool ask_all(const std::vector<Question> &questions, const Patience &patience,
-             const Streams &streams) {
+bool ask_all(const std::vector<Question> &all, const Patience &patience, const Streams &streams) {
+    const std::vector<Question> questions = to_be_asked(all, patience);
     const auto board = std::make_shared<Board>();
     board->answers.resize(questions.size());
     for (std::size_t i = 0; i < questions.size(); ++i)
         start(board, i, questions[i]);
     bool complete = false;
     {
-        Notice notice(streams);
+        Notice notice(streams, !patience.repeated);
         complete = wait_for_answers(*board, questions, patience, notice);
     }
     const std::lock_guard lock(board->mutex);
+    board->closed = true;
+    for (const std::string &about : unanswered(*board, questions))
+        left_behind().add(about);
     for (const std::optional<Delivery> &delivery : board->answers)
         if (delivery)
             (*delivery)();
+    complete = complete && questions.size() == all.size();
     if (!complete)
         kill_descendants();
     return complete;

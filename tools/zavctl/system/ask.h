@@ -22,11 +22,16 @@ struct Question {
 struct Patience {
     std::chrono::seconds limit{60}; // for all questions together
     std::chrono::seconds usual{20}; // the library's own wait for a device that may still appear
+
+    // Asked again and again: nothing is told while waiting, and what still waits for an answer from
+    // before, by its `about`, is not asked another time. Threads that hang are thus no more than
+    // there are things to ask about.
+    bool repeated = false;
 };
 
-// True if all have answered. Otherwise the tools that still run have been ended.
-bool ask_all(const std::vector<Question> &questions, const Patience &patience,
-             const Streams &streams);
+// True if all have answered. Otherwise, also after an interrupt that is noted, the tools that still
+// run have been ended.
+bool ask_all(const std::vector<Question> &all, const Patience &patience, const Streams &streams);
 
 // "waiting for disk 3 and array 4, at most 12 s more": the line on the terminal.
 std::string waiting_line(const std::vector<std::string> &about, std::chrono::seconds waited,
