@@ -1,5 +1,6 @@
 #include "command_line.h"
 
+#include "core/monitoring.h"
 #include "core/suggest.h"
 #include "objects/objects.h"
 
@@ -82,7 +83,16 @@ std::string hint(const std::string &typed, const std::vector<std::string> &words
     return near.empty() ? "" : fmt::format(" Did you mean '{}'?", near);
 }
 
+// A monitoring scheduler reads standard output, and knows no exit status but four.
+bool is_for_scheduler(const CLI::App &app) {
+    return path_of(app) == "zavctl check";
+}
+
 Parsed wrong_usage(const CLI::App &app, const std::string &message) {
+    if (is_for_scheduler(app)) {
+        const PluginResult result = unknown_result(message);
+        return {false, result.status, result.output, ""};
+    }
     return {false, exit_usage, "",
             fmt::format("zavctl: {}\nTry '{} --help'.\n", message, path_of(app))};
 }

@@ -50,6 +50,8 @@ void add_bios(CLI::App &root, Session &session);
 void add_name(CLI::App &root, Session &session);
 void add_event(CLI::App &root, Session &session);
 void add_watch(CLI::App &root, Session &session);
+void add_metrics(CLI::App &root, Session &session);
+void add_check(CLI::App &root, Session &session);
 void add_doctor(CLI::App &root, Session &session);
 
 } // namespace zavctl
