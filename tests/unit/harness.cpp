@@ -221,6 +221,8 @@ extern "C" {
 
 int system(const char *command) {
     harness::note_command(command);
+    if (harness::record().before_command)
+        harness::record().before_command(command);
     if (harness::record().shell) {
         const harness::Answer answer = harness::record().shell->answer(command);
         errno = answer.error;

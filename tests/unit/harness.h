@@ -61,6 +61,7 @@ struct Record {
     std::vector<std::string> commands;  // run by system or popen, in order
     std::vector<std::string> steps;     // the commands and, as "sleep 2" or "usleep 200", the waits
     std::optional<ScriptedShell> shell; // stands in for the shell
+    std::function<void(const std::string &)> before_command;
     std::vector<LogRow> log;
     bool log_is_open = false;
     std::vector<unsigned> sleeps;             // seconds

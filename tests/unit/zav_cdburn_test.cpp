@@ -257,6 +257,15 @@ TEST_F(Burning, NeedsTheSessionsOfACd) {
     cd(1, std::string(kCdR) + "0,11702\n\n");
     EXPECT_EQ(burn("/scratch/tree", 1), ZAV_RC_ERR_BADDISC); // the query does not know its state
     cd(1, std::string(kCdR) + "0,11702\n");
+    int asked = 0;
+    record().before_command = [&asked](const std::string &command) {
+        if (command == kMsinfo && ++asked == 2)
+            put("/tmp/cd.outfile", "0,11702\n\n");
+    };
+    EXPECT_EQ(burn("/scratch/tree", 1), ZAV_RC_ERR_CDTOOL);
+    EXPECT_EQ(asked, 2);
+    record().before_command = nullptr;
+    cd(1, std::string(kCdR) + "0,11702\n");
     fails("-msinfo"); // which leaves it appendable
     EXPECT_EQ(burn("/scratch/tree", 1), ZAV_RC_ERR_CDTOOL);
     EXPECT_EQ(record().steps.back(), kMsinfo);

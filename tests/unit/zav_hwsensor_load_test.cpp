@@ -61,6 +61,13 @@ TEST_F(Load, OfTheProcessorIsTheShareOfFourCounters) {
     EXPECT_EQ(record().sleeps, std::vector{7U});
 }
 
+TEST_F(Load, OfTheProcessorStandsOnTheFirstLineThatNamesIt) {
+    processor("intr 5 6 7 8\ncpu 0 0 0 0", "intr 500 6 7 8\ncpu 50 0 0 50");
+    CpuInfo cpu = {};
+    EXPECT_EQ(cpuinfo(&cpu, 1), ZAV_RC_OK);
+    EXPECT_FLOAT_EQ(cpu.user, 50.0F);
+}
+
 TEST_F(Load, OfTheProcessorCountsWholeTicks) {
     processor("cpu 0.6 0 0 10.6", "cpu 1.6 0 0 13.3");
     CpuInfo cpu = {};
