@@ -122,6 +122,13 @@ TEST(SensorReport, AStatusThatIsNeitherZeroNorOneIsNotBelieved) {
               "its status file holds '2', neither 0 nor 1: the probe may be faulty");
 }
 
+TEST(SensorReport, AnAnswerThatIsNotBelievedIsShownAsUnknown) {
+    const SensorReport report = reading("thermal-2", 0);
+    EXPECT_FALSE(holds(screen_of(sensor_list_section({report})), "normal"));
+    EXPECT_TRUE(holds(screen_of(sensor_overview_section({report})), "RT1: 0.0 C (unknown)"));
+    EXPECT_EQ(sensor_json(report)["state"], "normal"); // as the library says
+}
+
 TEST(SensorReport, TheListHasOneLinePerSensor) {
     const Section section = sensor_list_section({reading("thermal-1", 45), reading("volt-1", 1.2),
                                                  reading("fan-1", 2400), reading("fan-4", 1)});

@@ -26,6 +26,11 @@ Finding finding(const NicReport &nic) {
     return about("does not exist", "do not exist");
 }
 
+// An answer that is not believed is not shown as if it were.
+std::string shown_link(const NicReport &nic) {
+    return severity(nic) == Severity::unknown ? "unknown" : link_word(nic);
+}
+
 Section common_section(const std::vector<NicReport> &nics) {
     Section section = section_of("nics", nics, nic_json, finding);
     const auto up = std::count_if(nics.begin(), nics.end(),
@@ -37,7 +42,7 @@ Section common_section(const std::vector<NicReport> &nics) {
 Details nic_details(const NicReport &nic) {
     Details details;
     details.add(nic.id.bond ? "Bond" : "Port", name_of(nic.id));
-    details.add("Link", link_word(nic), severity(nic));
+    details.add("Link", shown_link(nic), severity(nic));
     details.add("Speed", speed_text(nic));
     add_verdict(details, nic_note(nic), nic.doubt);
     return details;
@@ -141,7 +146,7 @@ Section nic_list_section(const std::vector<NicReport> &nics) {
     section.table = Table({"PORT", "LINK", "SPEED", "NOTE"}, 1);
     for (const NicReport &nic : nics)
         section.table.add(severity(nic),
-                          {name_of(nic.id), link_word(nic), speed_text(nic), nic_note(nic)});
+                          {name_of(nic.id), shown_link(nic), speed_text(nic), nic_note(nic)});
     return section;
 }
 

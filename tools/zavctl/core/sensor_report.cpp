@@ -81,6 +81,11 @@ Finding finding(const SensorReport &report) {
                              sensor_state_word(report))};
 }
 
+// An answer that is not believed is not shown as if it were.
+std::string shown_state(const SensorReport &report) {
+    return severity(report) == Severity::unknown ? "unknown" : sensor_state_word(report);
+}
+
 bool has_driver_file(const SensorReport &report) {
     return std::string_view(report.sensor->file).starts_with("sensor/");
 }
@@ -142,7 +147,7 @@ Details sensor_details(const SensorReport &report) {
     details.add("Sensor", word_of(sensor));
     if (*sensor.place != '\0')
         details.add("Place", sensor.place);
-    details.add("State", sensor_state_word(report), severity(report));
+    details.add("State", shown_state(report), severity(report));
     details.add("Reading", value_text(report));
     details.add("Warning at", warning_text(sensor));
     details.add("Critical at", critical_text(sensor));
@@ -159,7 +164,7 @@ std::string short_text(const SensorReport &report) {
     return severity(report) == Severity::ok
                ? text
                : fmt::format("{} ({})", text,
-                             is_latched(report) ? "latched alarm" : sensor_state_word(report));
+                             is_latched(report) ? "latched alarm" : shown_state(report));
 }
 
 void add_kind(Table &table, SensorKind kind, const std::vector<SensorReport> &reports) {
@@ -261,7 +266,7 @@ Section sensor_list_section(const std::vector<SensorReport> &reports) {
         const std::string note = silent && has_driver_file(report) ? "" : sensor_note(report);
         section.table.add(severity(report),
                           {word_of(sensor), value_text(report), warning_text(sensor),
-                           critical_text(sensor), sensor_state_word(report), sensor.place},
+                           critical_text(sensor), shown_state(report), sensor.place},
                           note);
     }
     return section;
@@ -293,7 +298,7 @@ Section sensor_reset_section(const std::vector<SensorReset> &resets) {
         const std::string name = word_of(*reset.after.sensor);
         section.table.add(reset.failure ? Severity::critical : severity(reset.after),
                           {name, reset.failure ? "not cleared" : "cleared", value_text(reset.after),
-                           sensor_state_word(reset.after), reset.after.sensor->place},
+                           shown_state(reset.after), reset.after.sensor->place},
                           reset.failure ? in_words(*reset.failure) : sensor_note(reset.after));
         Json &record = section.records[index++];
         record["reset"] = reset.failure ? "failed" : "cleared";
