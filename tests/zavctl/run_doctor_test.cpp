@@ -70,3 +70,11 @@ TEST(RunDoctor, SeesWhatTheExchangeOfADiskNeeds) {
         EXPECT_EQ(checks("zavsim act tool " + std::string(tool) + " is missing;")[tool], "warning");
     EXPECT_EQ(checks("", {"--hosts", "ata"})["sata-hosts"], "warning");
 }
+
+TEST(RunDoctor, SeesWhatSensorsNetworkAndEventsNeed) {
+    EXPECT_EQ(checks("zavsim act tool ethtool is missing;")["ethtool"], "warning");
+    EXPECT_EQ(checks("rm /dev/zavevent0;")["event-device"], "warning");
+    EXPECT_EQ(checks("rm /dev/zavledevent;")["led-device"], "warning");
+    EXPECT_EQ(checks("", {"--bare"})["sensors"], "warning");
+    EXPECT_EQ(checks("", {"--bare"})["gpio"], "warning");
+}

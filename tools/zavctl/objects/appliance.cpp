@@ -1,6 +1,7 @@
 #include "appliance.h"
 
 #include "asking.h"
+#include "health_surveys.h"
 #include "surveys.h"
 #include "volume_surveys.h"
 
@@ -17,6 +18,10 @@ struct Asked {
     Shared<GroupReport> groups = no_reports<GroupReport>();
     Shared<VolumeReport> volumes = no_reports<VolumeReport>();
     Shared<PvReport> pvs = no_reports<PvReport>();
+    Shared<SensorReport> sensors = no_reports<SensorReport>();
+    Shared<NicReport> nics = no_reports<NicReport>();
+    Shared<UpsReport> ups = no_reports<UpsReport>();
+    Shared<LoadReport> load = no_reports<LoadReport>();
 };
 
 // A survey of disks or arrays. Behind a RAID controller it is not known what to ask before the
@@ -98,11 +103,37 @@ Survey pvs_survey(const Machine &machine, const Session &session, const Asked &a
             }};
 }
 
+Survey sensors_survey(const Machine &machine, const Session &session, const Asked &asked) {
+    return {ask_sensors(listed_sensors(machine), session, asked.sensors),
+            [asked] { return titled(sensor_overview_section(*asked.sensors), "Sensors"); }};
+}
+
+Survey nics_survey(const Machine & /*all have some*/, const Session &session, const Asked &asked) {
+    return {ask_nics(all_nics(), session, asked.nics),
+            [asked] { return titled(nic_list_section(existing(*asked.nics)), "Network"); }};
+}
+
+Survey ups_survey(const Machine & /*any may have one*/, const Session &session,
+                  const Asked &asked) {
+    return {ask_ups(session, asked.ups), [asked] {
+                Section section = ups_overview_section(asked.ups->front());
+                section.title = section.table.empty() ? "" : "UPS";
+                return section;
+            }};
+}
+
+// Without the processor: nobody waits ten seconds for a screen whose other answers are there.
+Survey load_survey(const Machine & /*every one*/, const Session &session, const Asked &asked) {
+    return {ask_load(false, session, asked.load),
+            [asked] { return titled(load_overview_section(*asked.load), "Load"); }};
+}
+
 // The sections below the heading, from top to bottom. What else the appliance has to say is a row
 // here: `status`, `watch`, `metrics` and `check` then have it, too.
 using MakeSurvey = Survey (*)(const Machine &, const Session &, const Asked &);
-constexpr MakeSurvey parts[] = {units_survey,  disks_survey, arrays_survey,
-                                groups_survey, pvs_survey,   volumes_survey};
+constexpr MakeSurvey parts[] = {units_survey, disks_survey,   arrays_survey,  groups_survey,
+                                pvs_survey,   volumes_survey, sensors_survey, nics_survey,
+                                ups_survey,   load_survey};
 
 // The model stands in the heading; its section adds its record and its findings.
 Section model_part(const Machine &machine) {

@@ -1,5 +1,7 @@
 #include "objects.h"
 
+#include "../core/driver_checks.h"
+#include "../system/drivers.h"
 #include "../system/platform.h"
 
 namespace zavctl {
@@ -11,7 +13,7 @@ constexpr VerbHelp help = {
     "Shown: one line per precondition with what was found and, where something is missing, what\n"
     "that means for the answers: the shell, the model and its configuration, the tools and what\n"
     "they answer, /proc/mdstat, device names, hot plug, the BIOS device, locks, the log, locale,\n"
-    "and what volumes and the exchange of a disk need besides.\n"
+    "and what volumes, the exchange of a disk, sensors, LEDs, events and network need besides.\n"
     "Warning: some functions or some arrays are affected.\n"
     "Critical: states of disks and arrays cannot be trusted or told.\n"
     "Nothing is changed (a file is made in /etc/Kiru/zav and removed); a tool that does not answer "
@@ -26,7 +28,9 @@ void add_doctor(CLI::App &root, Session &session) {
     CLI::App *doctor = add_verb(root, session, "doctor", help);
     doctor->callback([&session] {
         session.action = [] {
-            const std::vector<Check> checks = platform_checks(read_platform(read_model()));
+            std::vector<Check> checks = platform_checks(read_platform(read_model()));
+            for (const Check &check : driver_checks(read_drivers()))
+                checks.push_back(check);
             return Answer{"doctor", "", {doctor_section(checks)}};
         };
     });

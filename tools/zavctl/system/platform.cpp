@@ -66,6 +66,8 @@ constexpr Tool tools[] = {
      Severity::critical},
     {"/usr/bin/query_sas.sh", "the cascade of expansion units",
      "every expansion unit reads as not there", hardware_raid_only, Severity::critical},
+    {"/sbin/ethtool", "link and speed of network ports", "every network port reads as not existing",
+     all_models, Severity::warning},
     {"udevinfo", "the addresses of devices", no_devices, all_models, Severity::warning},
     {"/sbin/sfdisk", "adding a disk", no_addition, software_raid, Severity::warning},
     {"/bin/dd", "adding a disk", no_addition, software_raid, Severity::warning},
