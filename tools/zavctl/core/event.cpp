@@ -170,7 +170,7 @@ std::string unit_subject(const zavRBODState &unit) {
 }
 
 std::string unit_text(const zavRBODState &unit) {
-    const std::string text = unit_subject(unit) + ": " + state_text(unit_states(), unit.state);
+    std::string text = unit_subject(unit) + ": " + state_text(unit_states(), unit.state);
     if (unit.id != ZAV_RBOD_TEMP_CPU && unit.id != ZAV_RBOD_VOLT_CPU)
         return text;
     return with_value(text, unit.value, unit.id == ZAV_RBOD_TEMP_CPU ? "C" : "V");
