@@ -1,7 +1,7 @@
 #!/usr/bin/env bash
 # A simulated appliance loses a disk and gets another, and a volume group comes and goes; on another,
-# a unit of its cascade runs hot and loses a disk. All with zavctl. Ends with status 0 if every step
-# came out as announced.
+# a unit of its cascade runs hot and loses a disk; a third one overheats, loses a fan, its power and a
+# link while it is watched. All with zavctl. Ends with status 0 if every step came out as announced.
 # usage: sim/demo.sh BUILD-DIRECTORY
 set -euo pipefail
 
@@ -16,6 +16,7 @@ if [ $# -eq 1 ]; then
     }
     play disks --model 2860-4
     play units --model 2980 --units 5
+    play health --model 2860-4
     exit
 fi
 PATH=$1:$PATH
@@ -107,6 +108,54 @@ units_scene() {
     zavsim act unit 3 temperature 45
     zavsim act unit 2 disk 4 appears
     show 1 zavctl array show 2-1
+}
+
+# Waits until the watch has told it, for half a minute of the reader's clock at most.
+told() {
+    local left=300
+    until grep -q -- "$1" "$watch_log"; do
+        left=$((left - 1))
+        [ $left -gt 0 ] || fail "the watch does not tell: $1"
+        sleep $((scale / 10))
+    done
+}
+
+health_scene() {
+    watch_log=$(mktemp)
+    tell "A third appliance is watched. Changes are pushed to the driver, where another program waits for them."
+    printf '\n%s$ zavctl watch --interval 2 --push & zavctl event follow &%s\n' "$bold" "$plain"
+    zavctl watch --interval 2 --push > >(tee "$watch_log" | sed -u 's/^/watch:  /') &
+    local watch=$!
+    zavctl event follow > >(sed -u 's/^/event:  /') &
+    local follow=$!
+    told OK
+
+    tell "The main board overheats."
+    zavsim act temperature 1 is 78
+    told 'thermal 1.*critical'
+
+    tell "A fan slows down, and stops."
+    zavsim act fan 2 stops
+    told 'fan 2.*critical'
+
+    tell "The power fails, and a link is lost."
+    zavsim act power fails
+    zavsim act port 1 loses its link
+    told 'UPS.*on battery'
+    told 'eth0.*down'
+    show 2 zavctl check
+
+    tell "All is mended. A monitor that reads metrics sees it, too."
+    zavsim act temperature 1 is 42
+    zavsim act fan 2 recovers
+    zavsim act power returns
+    zavsim act port 1 gets its link
+    told 'UPS.*-> online'
+    told 'eth0.*-> up'
+    kill "$watch" "$follow"
+    wait "$watch" "$follow" || fail "the watch does not end well"
+    show 0 zavctl check
+    show 0 sh -c "zavctl metrics | grep -E '^zav_(temperature|fan|ups)'"
 }
 
 "$2_scene"
