@@ -12,11 +12,12 @@ std::string watched(const std::string &options, const std::string &happens, cons
            "; exit $status";
 }
 
-// A round asks a few groups' volumes, whose query leaves this file: when it has come back that
-// often, the first round is over.
+// A round asks a few groups and volumes, whose query writes this file: when it has been written
+// that often, the first round is over.
 constexpr const char *first_round_is_over =
-    "for i in 1 2 3 4 5 6 7 8 9; do until [ -e /etc/Kiru/zav/.vgs ]; do sleep 1; done; "
-    "rm -f /etc/Kiru/zav/.vgs; done; ";
+    "writings=0; last=; while [ $writings -lt 10 ]; do "
+    "now=$(stat -c %y /etc/Kiru/zav/.vgs 2>/dev/null); "
+    "[ \"$now\" = \"$last\" ] || writings=$((writings + 1)); last=$now; sleep 1; done; ";
 
 } // namespace
 
