@@ -34,6 +34,18 @@ TEST(RunMetrics, AFileIsReplacedWholeWhateverTheState) {
     EXPECT_TRUE(holds(run.out, "zav_disk_state{disk=\"3\",state=\"failed\"} 1\n")) << run.out;
 }
 
+TEST(RunCheck, TheProcessorIsMeasuredForTheLoadAlone) {
+    EXPECT_TRUE(holds(on_zav("zavctl check load").out, " processor="));
+    EXPECT_FALSE(holds(on_zav("zavctl check").out, "processor"));
+}
+
+TEST(RunMetrics, TheProcessorIsMeasuredUnlessItIsLeftOut) {
+    EXPECT_TRUE(holds(on_zav("zavctl metrics").out, "\nzav_processor_used_ratio 0"));
+    const Outcome run = on_zav("zavctl metrics --no-processor");
+    EXPECT_TRUE(holds(run.out, "\nzav_memory_used_ratio 0"));
+    EXPECT_FALSE(holds(run.out, "processor"));
+}
+
 TEST(RunMetrics, AFileThatCannotBeWrittenIsTold) {
     const Outcome run = on_zav("zavctl metrics --output /nonexistent/m.prom");
     EXPECT_EQ(run.status, 3);

@@ -9,6 +9,7 @@
 
 namespace zavctl {
 
+// NOLINTNEXTLINE(bugprone-exception-escape): no exception leaves the move of a Json
 struct ActionReport {
     std::string key;  // member of the JSON object: "uart"
     std::string kind; // of the record

@@ -18,117 +18,117 @@ constexpr Severity unknown = Severity::unknown;
 constexpr Severity critical = Severity::critical;
 
 constexpr StateWord types[] = {
-    {ZAV_EVENT_INIT, "init", ok},       {ZAV_EVENT_FAN, "fan", ok},
-    {ZAV_EVENT_THERMAL, "thermal", ok}, {ZAV_EVENT_VOLTAGE, "volt", ok},
-    {ZAV_EVENT_UPS, "ups", ok},         {ZAV_EVENT_RAID, "array", ok},
-    {ZAV_EVENT_HDD, "disk", ok},        {ZAV_EVENT_DISC, "media", ok},
-    {ZAV_EVENT_LVM, "lvm", ok},         {ZAV_EVENT_NET, "nic", ok},
-    {ZAV_EVENT_SYSINFO, "load", ok},    {ZAV_EVENT_RBOD, "unit", ok},
+    {"init", ZAV_EVENT_INIT, ok},       {"fan", ZAV_EVENT_FAN, ok},
+    {"thermal", ZAV_EVENT_THERMAL, ok}, {"volt", ZAV_EVENT_VOLTAGE, ok},
+    {"ups", ZAV_EVENT_UPS, ok},         {"array", ZAV_EVENT_RAID, ok},
+    {"disk", ZAV_EVENT_HDD, ok},        {"media", ZAV_EVENT_DISC, ok},
+    {"lvm", ZAV_EVENT_LVM, ok},         {"nic", ZAV_EVENT_NET, ok},
+    {"load", ZAV_EVENT_SYSINFO, ok},    {"unit", ZAV_EVENT_RBOD, ok},
 };
 
 constexpr StateWord sensors[] = {
-    {ZAV_SENSOR_NORMAL, "normal", ok},
-    {ZAV_SENSOR_WARNING, "warning", warning},
-    {ZAV_SENSOR_CRITICAL, "critical", critical},
-    {ZAV_SENSOR_ERR, "unknown", unknown},
+    {"normal", ZAV_SENSOR_NORMAL, ok},
+    {"warning", ZAV_SENSOR_WARNING, warning},
+    {"critical", ZAV_SENSOR_CRITICAL, critical},
+    {"unknown", ZAV_SENSOR_ERR, unknown},
 };
 
 constexpr StateWord ups[] = {
-    {ZAV_UPS_ONLINE, "online", ok},
-    {ZAV_UPS_ONBATT, "on battery", warning},
-    {ZAV_UPS_OTHER, "other", warning},
+    {"online", ZAV_UPS_ONLINE, ok},
+    {"on battery", ZAV_UPS_ONBATT, warning},
+    {"other", ZAV_UPS_OTHER, warning},
 };
 
 constexpr StateWord disks[] = {
-    {ZAV_HDD_FOUND, "found", ok},
-    {ZAV_HDD_ABSENT, "absent", critical},
-    {ZAV_HDD_FAILED, "failed", critical},
+    {"found", ZAV_HDD_FOUND, ok},
+    {"absent", ZAV_HDD_ABSENT, critical},
+    {"failed", ZAV_HDD_FAILED, critical},
 };
 
 constexpr StateWord arrays[] = {
-    {ZAV_RAID_NORMAL, "normal", ok},
-    {ZAV_RAID_DEGRADED, "degraded", warning},
-    {ZAV_RAID_RESYNC, "resync", warning},
-    {ZAV_RAID_FAILED, "failed", critical},
-    {ZAV_RAID_NOT_EXIST, "not_exist", critical},
+    {"normal", ZAV_RAID_NORMAL, ok},
+    {"degraded", ZAV_RAID_DEGRADED, warning},
+    {"resync", ZAV_RAID_RESYNC, warning},
+    {"failed", ZAV_RAID_FAILED, critical},
+    {"not_exist", ZAV_RAID_NOT_EXIST, critical},
 };
 
 constexpr StateWord groups[] = {
-    {ZAV_LVM_NORMAL, "normal", ok},       {ZAV_LVM_DEGRADED, "degraded", warning},
-    {ZAV_LVM_FAILED, "failed", critical}, {ZAV_LVM_NOT_EXIST, "not_exist", critical},
-    {ZAV_LVM_FULL, "full", warning},      {ZAV_LVM_INACTIVE, "inactive", warning},
+    {"normal", ZAV_LVM_NORMAL, ok},       {"degraded", ZAV_LVM_DEGRADED, warning},
+    {"failed", ZAV_LVM_FAILED, critical}, {"not_exist", ZAV_LVM_NOT_EXIST, critical},
+    {"full", ZAV_LVM_FULL, warning},      {"inactive", ZAV_LVM_INACTIVE, warning},
 };
 
 constexpr StateWord volumes[] = {
-    {0, "normal", ok},
-    {ZAV_LVM_NORMAL, "normal", ok},
-    {ZAV_LVM_DEGRADED, "degraded", warning},
-    {ZAV_LVM_FAILED, "failed", critical},
-    {ZAV_LVM_NOT_EXIST, "not_exist", critical},
-    {ZAV_LVM_FULL, "full", warning},
-    {ZAV_LVM_INACTIVE, "inactive", warning},
+    {"normal", 0, ok},
+    {"normal", ZAV_LVM_NORMAL, ok},
+    {"degraded", ZAV_LVM_DEGRADED, warning},
+    {"failed", ZAV_LVM_FAILED, critical},
+    {"not_exist", ZAV_LVM_NOT_EXIST, critical},
+    {"full", ZAV_LVM_FULL, warning},
+    {"inactive", ZAV_LVM_INACTIVE, warning},
 };
 
 constexpr StateWord networks[] = {
-    {ZAV_NET_UP, "up", ok},
-    {ZAV_NET_DOWN, "down", warning},
-    {ZAV_NET_NOT_EXIST, "not_exist", warning},
-    {ZAV_NET_ERR, "unknown", unknown},
+    {"up", ZAV_NET_UP, ok},
+    {"down", ZAV_NET_DOWN, warning},
+    {"not_exist", ZAV_NET_NOT_EXIST, warning},
+    {"unknown", ZAV_NET_ERR, unknown},
 };
 
 constexpr StateWord loads[] = {
-    {ZAV_SYSINFO_NORMAL, "normal", ok},
-    {ZAV_SYSINFO_WARNING, "warning", warning},
-    {ZAV_SYSINFO_CRITICAL, "critical", critical},
-    {ZAV_SYSINFO_ERR, "unknown", unknown},
+    {"normal", ZAV_SYSINFO_NORMAL, ok},
+    {"warning", ZAV_SYSINFO_WARNING, warning},
+    {"critical", ZAV_SYSINFO_CRITICAL, critical},
+    {"unknown", ZAV_SYSINFO_ERR, unknown},
 };
 
 constexpr StateWord units[] = {
-    {ZAV_RBOD_NORMAL, "normal", ok},          {ZAV_RBOD_WARN, "warning", warning},
-    {ZAV_RBOD_ALARM, "alarm", critical},      {ZAV_RBOD_FAIL, "failed", critical},
-    {ZAV_RBOD_NOTEXIST, "missing", critical}, {ZAV_RBOD_EXIST, "present", ok},
+    {"normal", ZAV_RBOD_NORMAL, ok},          {"warning", ZAV_RBOD_WARN, warning},
+    {"alarm", ZAV_RBOD_ALARM, critical},      {"failed", ZAV_RBOD_FAIL, critical},
+    {"missing", ZAV_RBOD_NOTEXIST, critical}, {"present", ZAV_RBOD_EXIST, ok},
 };
 
 constexpr StateWord levels[] = {
-    {ZAV_RAIDLVL_NONE, "none", ok},   {ZAV_RAIDLVL_0, "raid0", ok},
-    {ZAV_RAIDLVL_1, "raid1", ok},     {ZAV_RAIDLVL_5, "raid5", ok},
-    {ZAV_RAIDLVL_6, "raid6", ok},     {ZAV_RAIDLVL_10, "raid10", ok},
-    {ZAV_RAIDLVL_50, "raid50", ok},   {ZAV_RAIDLVL_60, "raid60", ok},
-    {ZAV_RAIDLVL_JBOD, "linear", ok},
+    {"none", ZAV_RAIDLVL_NONE, ok},   {"raid0", ZAV_RAIDLVL_0, ok},
+    {"raid1", ZAV_RAIDLVL_1, ok},     {"raid5", ZAV_RAIDLVL_5, ok},
+    {"raid6", ZAV_RAIDLVL_6, ok},     {"raid10", ZAV_RAIDLVL_10, ok},
+    {"raid50", ZAV_RAIDLVL_50, ok},   {"raid60", ZAV_RAIDLVL_60, ok},
+    {"linear", ZAV_RAIDLVL_JBOD, ok},
 };
 
 constexpr StateWord kinds_of_disc[] = {
-    {ZAV_DVD_ROM, "DVD-ROM", ok},
-    {ZAV_DVD_MINUS_R_SEQ, "DVD-R", ok},
-    {ZAV_DVD_RAM, "DVD-RAM", ok},
-    {ZAV_DVD_MINUS_RW_RES, "DVD-RW restricted overwrite", ok},
-    {ZAV_DVD_MINUS_RW_SEQ, "DVD-RW sequential", ok},
-    {ZAV_DVD_PLUS_RW, "DVD+RW", ok},
-    {ZAV_DVD_PLUS_R, "DVD+R", ok},
-    {ZAV_DVD_PLUS_R_DOUBLE, "DVD+R double layer", ok},
-    {ZAV_CD_RW, "CD-RW", ok},
-    {ZAV_CD_R, "CD-R", ok},
-    {ZAV_DISC_NONE, "none", ok},
-    {ZAV_DISC_UNKNOWN, "unknown", unknown},
+    {"DVD-ROM", ZAV_DVD_ROM, ok},
+    {"DVD-R", ZAV_DVD_MINUS_R_SEQ, ok},
+    {"DVD-RAM", ZAV_DVD_RAM, ok},
+    {"DVD-RW restricted overwrite", ZAV_DVD_MINUS_RW_RES, ok},
+    {"DVD-RW sequential", ZAV_DVD_MINUS_RW_SEQ, ok},
+    {"DVD+RW", ZAV_DVD_PLUS_RW, ok},
+    {"DVD+R", ZAV_DVD_PLUS_R, ok},
+    {"DVD+R double layer", ZAV_DVD_PLUS_R_DOUBLE, ok},
+    {"CD-RW", ZAV_CD_RW, ok},
+    {"CD-R", ZAV_CD_R, ok},
+    {"none", ZAV_DISC_NONE, ok},
+    {"unknown", ZAV_DISC_UNKNOWN, unknown},
 };
 
 constexpr StateWord states_of_disc[] = {
-    {ZAV_DISC_BLANK, "blank", ok},
-    {ZAV_DISC_COMPLETE, "complete", ok},
-    {ZAV_DISC_APPENDABLE, "appendable", ok},
-    {ZAV_DISC_STATE_UNKNOWN, "unknown", unknown},
+    {"blank", ZAV_DISC_BLANK, ok},
+    {"complete", ZAV_DISC_COMPLETE, ok},
+    {"appendable", ZAV_DISC_APPENDABLE, ok},
+    {"unknown", ZAV_DISC_STATE_UNKNOWN, unknown},
 };
 
 // The numbers of zavGetStateSysinfo.
 constexpr StateWord probes[] = {
-    {0x101, "processor", ok}, {0x102, "swap", ok}, {0x103, "/", ok},
-    {0x105, "/var", ok},      {0x106, "/tmp", ok}, {0x107, "/mnt/buffer", ok},
+    {"processor", 0x101, ok}, {"swap", 0x102, ok}, {"/", 0x103, ok},
+    {"/var", 0x105, ok},      {"/tmp", 0x106, ok}, {"/mnt/buffer", 0x107, ok},
 };
 
 constexpr StateWord parts_of_unit[] = {
-    {ZAV_RBOD_EXPANDER, "expander", ok},
-    {ZAV_RBOD_TEMP_CPU, "temperature", ok},
-    {ZAV_RBOD_VOLT_CPU, "voltage", ok},
+    {"expander", ZAV_RBOD_EXPANDER, ok},
+    {"temperature", ZAV_RBOD_TEMP_CPU, ok},
+    {"voltage", ZAV_RBOD_VOLT_CPU, ok},
 };
 
 char folded(char c) {

@@ -11,8 +11,8 @@
 namespace zavctl {
 
 struct StateWord {
-    int code;
     const char *word;
+    int code;
     Severity severity;
 };
 

@@ -15,20 +15,20 @@ namespace {
 constexpr int three_state_led = 5;
 
 struct LedState {
-    int state;
     const char *word;
+    int state;
     bool of_panel;
     bool of_disk;
 };
 
 constexpr LedState led_states[] = {
-    {ZAV_LED_OFF, "off", true, true},
-    {ZAV_LED_ON, "on", true, false},
-    {ZAV_LED_VALUE2, "value2", true, false},
-    {ZAV_HDDLED_SECOND_ON, "second-on", false, true},
-    {ZAV_HDDLED_FIRST_ON, "first-on", false, true},
-    {ZAV_HDDLED_FIRST_2, "first-2", false, true},
-    {ZAV_HDDLED_FIRST_2_SECOND_ON, "first-2-second-on", false, true},
+    {"off", ZAV_LED_OFF, true, true},
+    {"on", ZAV_LED_ON, true, false},
+    {"value2", ZAV_LED_VALUE2, true, false},
+    {"second-on", ZAV_HDDLED_SECOND_ON, false, true},
+    {"first-on", ZAV_HDDLED_FIRST_ON, false, true},
+    {"first-2", ZAV_HDDLED_FIRST_2, false, true},
+    {"first-2-second-on", ZAV_HDDLED_FIRST_2_SECOND_ON, false, true},
 };
 
 bool can_be(int led, const LedState &state) {

@@ -1,5 +1,6 @@
 #include "metrics.h"
 
+#include "metrics_tables.h"
 #include "record.h"
 #include "thing.h"
 
@@ -65,148 +66,15 @@ class Family {
     std::string samples_;
 };
 
-// A number of each record, such as the reading of a sensor.
-struct Measure {
-    const char *family;
-    const char *help;
-    const char *key;    // of the records
-    const char *filter; // the field that tells whether a record is meant, "" for all
-    const char *word;   // what it then says
-    std::vector<std::pair<const char *, const char *>> labels; // label, field
-    const char *object; // of the record that holds the number, "" for the record itself
-    const char *field;
-    double divisor; // to the base unit
-};
-
-constexpr double percent = 100;
-constexpr double megabit = 1 / 125000.0; // bytes
-
-const std::vector<Measure> &measures() {
-    static const std::vector<Measure> table = {
-        {"zav_temperature_celsius",
-         "Temperature by the main board's or the RAID controller's sensor.",
-         "sensors",
-         "kind",
-         "thermal",
-         {{"sensor", "sensor"}, {"place", "place"}},
-         "",
-         "value",
-         1},
-        {"zav_voltage_volts",
-         "Voltage by the main board's sensor.",
-         "sensors",
-         "kind",
-         "volt",
-         {{"sensor", "sensor"}, {"place", "place"}},
-         "",
-         "value",
-         1},
-        {"zav_fan_speed_rpm",
-         "Speed of a fan in revolutions per minute.",
-         "sensors",
-         "kind",
-         "fan",
-         {{"sensor", "sensor"}, {"place", "place"}},
-         "",
-         "value",
-         1},
-        {"zav_unit_temperature_celsius",
-         "Temperature of an expansion unit.",
-         "units",
-         "",
-         "",
-         {{"unit", "unit"}},
-         "temperature",
-         "value",
-         1},
-        {"zav_unit_voltage_volts",
-         "Voltage of an expansion unit.",
-         "units",
-         "",
-         "",
-         {{"unit", "unit"}},
-         "voltage",
-         "value",
-         1},
-        {"zav_array_rebuild_progress_ratio",
-         "Progress of the array's rebuild, while one runs or waits.",
-         "arrays",
-         "",
-         "",
-         {{"array", "id"}},
-         "",
-         "rebuild_percent",
-         percent},
-        {"zav_volume_used_ratio",
-         "How full the volume's file system is.",
-         "logical_volumes",
-         "",
-         "",
-         {{"volume", "volume"}, {"mountpoint", "mount_point"}},
-         "",
-         "usage_percent",
-         percent},
-        {"zav_ups_charge_ratio",
-         "Charge of the UPS's battery.",
-         "ups",
-         "",
-         "",
-         {},
-         "",
-         "charge_percent",
-         percent},
-        {"zav_network_speed_bytes_per_second",
-         "Speed of the port's link.",
-         "nics",
-         "",
-         "",
-         {{"device", "nic"}},
-         "",
-         "speed_mbit",
-         megabit},
-        {"zav_processor_used_ratio",
-         "Use of the processor.",
-         "load",
-         "probe",
-         "processor",
-         {},
-         "",
-         "used_percent",
-         percent},
-        {"zav_memory_used_ratio",
-         "Memory in use.",
-         "load",
-         "probe",
-         "memory",
-         {},
-         "",
-         "used_percent",
-         percent},
-        {"zav_swap_used_ratio",
-         "Swap in use.",
-         "load",
-         "probe",
-         "swap",
-         {},
-         "",
-         "used_percent",
-         percent},
-        {"zav_filesystem_used_ratio",
-         "How full a file system of the system itself is.",
-         "load",
-         "probe",
-         "file system",
-         {{"mountpoint", "path"}},
-         "",
-         "used_percent",
-         percent},
-    };
-    return table;
-}
-
 std::string label_value(const Json &record, const char *field) {
     const std::string text = text_in(record, field);
     return text.empty() ? number_in(record, field) : text;
+}
+
+void add_labels(Labels &labels, std::span<const LabelField> fields, const Json &record) {
+    for (const LabelField &field : fields)
+        if (field.label != nullptr)
+            labels.emplace_back(field.label, label_value(record, field.field));
 }
 
 void add_measure(const Measure &measure, const Json &record, Family &family) {
@@ -218,8 +86,7 @@ void add_measure(const Measure &measure, const Json &record, Family &family) {
     if (!value || !std::isfinite(*value))
         return;
     Labels labels;
-    for (const auto &[label, field] : measure.labels)
-        labels.emplace_back(label, label_value(record, field));
+    add_labels(labels, measure.labels, record);
     family.add(labels, *value / measure.divisor);
 }
 
@@ -232,88 +99,19 @@ std::string measured(const Measure &measure, const Answer &answer) {
     return family.text();
 }
 
-// One series for each state that a thing can have: 1 for the one that it has.
-struct StateSet {
-    const char *family;
-    const char *help;
-    const char *key;
-    std::vector<std::pair<const char *, const char *>> labels; // label, field
-    const char *field;
-    std::vector<const char *> states; // and "unknown"
-};
-
-const std::vector<StateSet> &state_sets() {
-    static const std::vector<StateSet> table = {
-        {"zav_disk_state",
-         "State of a disk.",
-         "disks",
-         {{"disk", "id"}},
-         "state",
-         {"found", "absent", "failed"}},
-        {"zav_array_state",
-         "State of an array.",
-         "arrays",
-         {{"array", "id"}},
-         "state",
-         {"normal", "degraded", "resync", "failed", "not_exist", "present"}},
-        {"zav_unit_state",
-         "State of an expansion unit.",
-         "units",
-         {{"unit", "unit"}},
-         "state",
-         {"present", "missing"}},
-        {"zav_volume_group_state",
-         "State of a volume group.",
-         "volume_groups",
-         {{"group", "name"}},
-         "state",
-         {"normal", "inactive", "failed", "not_exist"}},
-        {"zav_volume_state",
-         "State of a logical volume.",
-         "logical_volumes",
-         {{"volume", "volume"}},
-         "state",
-         {"normal", "full", "inactive", "failed", "not_exist"}},
-        {"zav_physical_volume_state",
-         "State of a physical volume.",
-         "physical_volumes",
-         {{"volume", "volume"}},
-         "state",
-         {"normal", "failed", "not_exist"}},
-        {"zav_sensor_state",
-         "State of a sensor; critical also while an alarm is latched.",
-         "sensors",
-         {{"sensor", "sensor"}, {"place", "place"}},
-         "state",
-         {"normal", "warning", "critical"}},
-        {"zav_network_state",
-         "Link of a port or bond.",
-         "nics",
-         {{"device", "nic"}},
-         "link",
-         {"up", "down", "not existing"}},
-        {"zav_ups_state",
-         "State of the UPS.",
-         "ups",
-         {},
-         "state",
-         {"online", "on battery", "other", "none"}},
-    };
-    return table;
-}
-
 void add_states(const StateSet &set, const Json &record, Family &family) {
     std::string has = text_in(record, set.field);
-    const bool known = std::any_of(set.states.begin(), set.states.end(),
-                                   [&has](const char *state) { return has == state; });
-    if (!known || severity_in(record) == Severity::unknown)
+    std::vector<std::string> states;
+    for (const char *state : set.states)
+        if (state != nullptr)
+            states.emplace_back(state);
+    if (std::find(states.begin(), states.end(), has) == states.end() ||
+        severity_in(record) == Severity::unknown)
         has = "unknown";
-    std::vector<std::string> states(set.states.begin(), set.states.end());
     states.emplace_back("unknown");
     for (const std::string &state : states) {
         Labels labels;
-        for (const auto &[label, field] : set.labels)
-            labels.emplace_back(label, label_value(record, field));
+        add_labels(labels, set.labels, record);
         labels.emplace_back("state", state);
         family.add(labels, state == has ? 1 : 0);
     }

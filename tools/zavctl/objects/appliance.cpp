@@ -12,7 +12,8 @@ namespace zavctl {
 namespace {
 
 struct Asked {
-    SharedCascade cascade;
+    Processor processor = Processor::left_out;
+    SharedCascade cascade{};
     Shared<DiskReport> disks = no_reports<DiskReport>();
     Shared<ArrayReport> arrays = no_reports<ArrayReport>();
     Shared<GroupReport> groups = no_reports<GroupReport>();
@@ -122,9 +123,8 @@ Survey ups_survey(const Machine & /*any may have one*/, const Session &session,
             }};
 }
 
-// Without the processor: nobody waits ten seconds for a screen whose other answers are there.
 Survey load_survey(const Machine & /*every one*/, const Session &session, const Asked &asked) {
-    return {ask_load(false, session, asked.load),
+    return {ask_load(asked.processor == Processor::measured, session, asked.load),
             [asked] { return titled(load_overview_section(*asked.load), "Load"); }};
 }
 
@@ -143,8 +143,9 @@ Section model_part(const Machine &machine) {
     return section;
 }
 
-std::vector<Survey> surveys_of(const Machine &machine, const Session &session) {
-    const Asked asked{begin_cascade(machine, session)};
+std::vector<Survey> surveys_of(const Machine &machine, const Session &session,
+                               Processor processor) {
+    const Asked asked{processor, begin_cascade(machine, session)};
     std::vector<Survey> surveys;
     if (machine.model.known())
         for (const MakeSurvey part : parts)
@@ -171,9 +172,9 @@ void ask(Session &session, const std::vector<Survey> &surveys) {
 
 } // namespace
 
-Answer ask_appliance(Session &session, const std::string &command) {
+Answer ask_appliance(Session &session, const std::string &command, Processor processor) {
     const Machine machine = read_machine();
-    const std::vector<Survey> surveys = surveys_of(machine, session);
+    const std::vector<Survey> surveys = surveys_of(machine, session, processor);
     ask(session, surveys);
     Answer answer{command, model_heading(machine.model), {model_part(machine)}};
     for (const Survey &survey : surveys)
