@@ -8,6 +8,7 @@
 #include <algorithm>
 #include <chrono>
 #include <condition_variable>
+#include <exception>
 #include <memory>
 #include <mutex>
 #include <thread>
@@ -34,21 +35,35 @@ struct Asking {
     std::mutex mutex;
     std::condition_variable done;
     std::optional<Answer> answer;
+    std::exception_ptr failure; // what asking ended with instead
+
+    bool over() const { return answer.has_value() || failure != nullptr; }
 };
+
+void ask_into(Asking &asking, Session &session, Processor processor) {
+    std::optional<Answer> answer;
+    std::exception_ptr failure;
+    try {
+        answer = ask_appliance(session, "check", processor);
+    } catch (...) {
+        failure = std::current_exception();
+    }
+    const std::lock_guard lock(asking.mutex);
+    asking.answer = std::move(answer);
+    asking.failure = failure;
+    asking.done.notify_all();
+}
 
 // Each round of questions is given a second less, so that what has answered by then is told.
 std::optional<Answer> asked_in_time(Session &session, Processor processor) {
     const std::chrono::seconds limit(session.options.timeout);
     session.options.timeout = std::max(1, session.options.timeout - 1);
     const auto asking = std::make_shared<Asking>();
-    std::thread([asking, &session, processor] {
-        Answer answer = ask_appliance(session, "check", processor);
-        const std::lock_guard lock(asking->mutex);
-        asking->answer = std::move(answer);
-        asking->done.notify_all();
-    }).detach();
+    std::thread([asking, &session, processor] { ask_into(*asking, session, processor); }).detach();
     std::unique_lock lock(asking->mutex);
-    asking->done.wait_for(lock, limit, [&asking] { return asking->answer.has_value(); });
+    asking->done.wait_for(lock, limit, [&asking] { return asking->over(); });
+    if (asking->failure != nullptr)
+        std::rethrow_exception(asking->failure);
     return asking->answer;
 }
 
