@@ -4,9 +4,11 @@
 #include "core/suggest.h"
 #include "objects/objects.h"
 
+#include <CLI/CLI.hpp>
 #include <fmt/format.h>
 
 #include <algorithm>
+#include <memory>
 
 #ifndef ZAVCTL_VERSION
 #    error "ZAVCTL_VERSION is to be defined by the build"
@@ -177,8 +179,6 @@ Parsed parse_words(CLI::App &root, const CLI::App &app, std::vector<std::string>
     }
 }
 
-} // namespace
-
 std::unique_ptr<CLI::App> make_command_line(Session &session) {
     auto root =
         std::make_unique<CLI::App>("Tells and changes the state of a storage appliance.", "zavctl");
@@ -186,16 +186,19 @@ std::unique_ptr<CLI::App> make_command_line(Session &session) {
     root->set_help_flag("-h,--help", "Print this help");
     root->set_version_flag("--version", "zavctl " ZAVCTL_VERSION);
     root->get_formatter()->label("SUBCOMMAND", "OBJECT [VERB]");
-    add_output_options(*root, session);
+    add_output_options(Command(root.get()), session);
     root->footer(root_footer);
     for (const AddObject add : object_table())
-        add(*root, session);
+        add(Command(root.get()), session);
     return root;
 }
 
-Parsed parse(CLI::App &root, Session &session, std::vector<std::string> words) {
+} // namespace
+
+Parsed parse(Session &session, std::vector<std::string> words) {
+    const auto root = make_command_line(session);
     help_as_option(words);
-    const Walk at = walk(root, words);
+    const Walk at = walk(*root, words);
     if (!at.unknown.empty())
         return wrong_usage(*at.app, unknown_word(at));
     const bool asks_help = std::any_of(words.begin(), words.end(), [](const std::string &word) {
@@ -203,7 +206,7 @@ Parsed parse(CLI::App &root, Session &session, std::vector<std::string> words) {
     });
     if (!verb_names(*at.app).empty() && !asks_help && !has_unknown_option(*at.app, words))
         return {false, exit_usage, "", help_of(*at.app)};
-    Parsed parsed = parse_words(root, *at.app, std::move(words));
+    Parsed parsed = parse_words(*root, *at.app, std::move(words));
     if (parsed.run && session.options.json && session.options.jsonl)
         return wrong_usage(*at.app, "--json and --jsonl exclude each other");
     return parsed;

@@ -3,13 +3,10 @@
 
 #include "objects/session.h"
 
-#include <memory>
 #include <string>
 #include <vector>
 
 namespace zavctl {
-
-std::unique_ptr<CLI::App> make_command_line(Session &session);
 
 struct Parsed {
     bool run = false;    // session.action is to be run
@@ -19,6 +16,6 @@ struct Parsed {
 };
 
 // Sets session.action or says why not.
-Parsed parse(CLI::App &root, Session &session, std::vector<std::string> words);
+Parsed parse(Session &session, std::vector<std::string> words);
 
 } // namespace zavctl

@@ -44,8 +44,7 @@ int run_action(const Streams &streams, const Session &session) {
 }
 
 int run(const Streams &streams, Session &session, const std::vector<std::string> &words) {
-    const auto root = make_command_line(session);
-    const Parsed parsed = parse(*root, session, words);
+    const Parsed parsed = parse(session, words);
     streams.say(parsed.message);
     if (!parsed.run)
         return written(streams, parsed.out, parsed.status);

@@ -233,13 +233,13 @@ std::vector<Question> ask_arrays(const Machine &machine, const std::vector<int> 
     return ask_arrays(machine, arrays, session, reports);
 }
 
-void add_array(CLI::App &root, Session &session) {
-    CLI::App *array = add_object(root, "array", "The RAID arrays: list, show");
+void add_array(Command root, Session &session) {
+    const Command array = add_object(root, "array", "The RAID arrays: list, show");
     const auto all = std::make_shared<bool>(false);
-    add_list(*array, session, list_help, [all](Session &asking) {
+    add_list(array, session, list_help, [all](Session &asking) {
         return list(asking, *all);
-    })->add_flag("--all", *all, "Ask every array that the model can have");
-    add_show<std::string>(*array, session, show_help,
+    }).add_flag("--all", *all, "Ask every array that the model can have");
+    add_show<std::string>(array, session, show_help,
                           {"N", "Number of the array, from 1; UNIT-N of an expansion unit; or the "
                                 "path of the array's device"},
                           show);

@@ -39,10 +39,10 @@ Shared<Report> no_reports() {
 }
 
 // A verb without operands.
-inline CLI::App *add_list(CLI::App &object, Session &session, const VerbHelp &help,
-                          std::function<Answer(Session &)> answer) {
-    CLI::App *verb = add_verb(object, session, "list", help);
-    verb->callback([&session, answer = std::move(answer)] {
+inline Command add_list(Command object, Session &session, const VerbHelp &help,
+                        std::function<Answer(Session &)> answer) {
+    const Command verb = add_verb(object, session, "list", help);
+    verb.callback([&session, answer = std::move(answer)] {
         session.action = [&session, answer] { return answer(session); };
     });
     return verb;
@@ -54,15 +54,15 @@ struct Operand {
     const char *meaning;
 };
 template <class Value>
-CLI::Option *add_show(CLI::App &object, Session &session, const VerbHelp &help,
-                      const Operand &operand,
-                      std::function<Answer(Session &, const std::vector<Value> &)> answer) {
+CommandOption add_show(Command object, Session &session, const VerbHelp &help,
+                       const Operand &operand,
+                       std::function<Answer(Session &, const std::vector<Value> &)> answer) {
     const auto values = std::make_shared<std::vector<Value>>();
-    CLI::App *verb = add_verb(object, session, "show", help);
-    verb->callback([&session, values, answer = std::move(answer)] {
+    const Command verb = add_verb(object, session, "show", help);
+    verb.callback([&session, values, answer = std::move(answer)] {
         session.action = [&session, values, answer] { return answer(session, *values); };
     });
-    return verb->add_option(operand.name, *values, operand.meaning)->required();
+    return verb.add_option(operand.name, *values, operand.meaning).required();
 }
 
 // What each word means; `meant` gives none for a word that it does not know, which is told to be

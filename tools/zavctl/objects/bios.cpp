@@ -103,43 +103,43 @@ Answer load(const Session &session, const std::string &file, bool yes) {
     return outcome_answer(load_bios_file(file, image));
 }
 
-void add_show(CLI::App &bios, Session &session) {
-    add_verb(bios, session, "show", show_help)->callback([&session] {
+void add_show(Command bios, Session &session) {
+    add_verb(bios, session, "show", show_help).callback([&session] {
         session.action = [] {
             return Answer{"bios show", "", {bios_section(read_model(), read_nvram())}};
         };
     });
 }
 
-void add_save(CLI::App &bios, Session &session) {
+void add_save(Command bios, Session &session) {
     const auto file = std::make_shared<std::string>();
     const auto force = std::make_shared<bool>(false);
-    CLI::App *verb = add_verb(bios, session, "save", save_help);
-    verb->add_option("FILE", *file, "The file to save into")->required();
-    verb->add_flag("--force", *force, "Replace a file that exists");
-    verb->callback([&session, file, force] {
+    const Command verb = add_verb(bios, session, "save", save_help);
+    verb.add_option("FILE", *file, "The file to save into").required();
+    verb.add_flag("--force", *force, "Replace a file that exists");
+    verb.callback([&session, file, force] {
         session.action = [file, force] { return save(*file, *force); };
     });
 }
 
-void add_load(CLI::App &bios, Session &session) {
+void add_load(Command bios, Session &session) {
     const auto file = std::make_shared<std::string>();
     const auto yes = std::make_shared<bool>(false);
-    CLI::App *verb = add_verb(bios, session, "load", load_help);
-    verb->add_option("FILE", *file, "A file written by 'zavctl bios save'")->required();
-    verb->add_flag("-y,--yes", *yes, "Do not ask");
-    verb->callback([&session, file, yes] {
+    const Command verb = add_verb(bios, session, "load", load_help);
+    verb.add_option("FILE", *file, "A file written by 'zavctl bios save'").required();
+    verb.add_flag("-y,--yes", *yes, "Do not ask");
+    verb.callback([&session, file, yes] {
         session.action = [&session, file, yes] { return load(session, *file, *yes); };
     });
 }
 
 } // namespace
 
-void add_bios(CLI::App &root, Session &session) {
-    CLI::App *bios = add_object(root, "bios", "BIOS identity and settings: show, save, load");
-    add_show(*bios, session);
-    add_save(*bios, session);
-    add_load(*bios, session);
+void add_bios(Command root, Session &session) {
+    const Command bios = add_object(root, "bios", "BIOS identity and settings: show, save, load");
+    add_show(bios, session);
+    add_save(bios, session);
+    add_load(bios, session);
 }
 
 } // namespace zavctl

@@ -13,7 +13,7 @@ bool confirmed(const Session &session, const std::string &question) {
 
 } // namespace
 
-std::shared_ptr<ChangeOptions> add_change_options(CLI::App &verb) {
+std::shared_ptr<ChangeOptions> add_change_options(Command verb) {
     auto options = std::make_shared<ChangeOptions>();
     verb.add_flag("-y,--yes", options->yes, "Do not ask");
     verb.add_flag("--dry-run", options->dry_run, "Tell what would happen, and change nothing");

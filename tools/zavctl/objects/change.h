@@ -3,6 +3,7 @@
 
 #include "../core/plan.h"
 #include "../system/change.h"
+#include "command.h"
 #include "session.h"
 
 #include <functional>
@@ -17,7 +18,7 @@ struct ChangeOptions {
     bool dry_run = false;
 };
 
-std::shared_ptr<ChangeOptions> add_change_options(CLI::App &verb);
+std::shared_ptr<ChangeOptions> add_change_options(Command verb);
 
 // Tells the plan and lets `act` run it, unless it is refused, only wanted to be seen, or the answer
 // to the question is no.

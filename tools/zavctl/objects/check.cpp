@@ -86,12 +86,12 @@ PluginResult check(Session &session, const std::vector<std::string> &objects) {
 
 } // namespace
 
-void add_check(CLI::App &root, Session &session) {
+void add_check(Command root, Session &session) {
     const auto objects = std::make_shared<std::vector<std::string>>();
-    CLI::App *verb = add_verb(root, session, "check", help);
-    verb->add_option("OBJECT", *objects,
-                     "What to judge: disk, array, unit, vg, lv, pv, sensor, nic, ups, load");
-    verb->callback([&session, objects] {
+    const Command verb = add_verb(root, session, "check", help);
+    verb.add_option("OBJECT", *objects,
+                    "What to judge: disk, array, unit, vg, lv, pv, sensor, nic, ups, load");
+    verb.callback([&session, objects] {
         session.program = [&session, objects] {
             const PluginResult result = check(session, *objects);
             return session.streams.write(result.output) == 0 ? result.status

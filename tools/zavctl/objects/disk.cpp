@@ -160,18 +160,18 @@ std::vector<Question> ask_disks(const Machine &machine, const std::vector<int> &
     return ask_disks(machine, disks, session, reports);
 }
 
-void add_disk(CLI::App &root, Session &session) {
-    CLI::App *disk = add_object(root, "disk", "The disks: list, show, remove, add");
+void add_disk(Command root, Session &session) {
+    const Command disk = add_object(root, "disk", "The disks: list, show, remove, add");
     const auto all = std::make_shared<bool>(false);
-    add_list(*disk, session, list_help, [all](Session &asking) {
+    add_list(disk, session, list_help, [all](Session &asking) {
         return list(asking, *all);
-    })->add_flag("--all", *all, "Ask every slot of the model, also those that no array uses");
-    add_show<std::string>(*disk, session, show_help,
+    }).add_flag("--all", *all, "Ask every slot of the model, also those that no array uses");
+    add_show<std::string>(disk, session, show_help,
                           {"N", "Number of the slot, from 1; UNIT-N of an expansion unit; or the "
                                 "path of the disk's device"},
                           show);
-    add_disk_remove(*disk, session);
-    add_disk_add(*disk, session);
+    add_disk_remove(disk, session);
+    add_disk_add(disk, session);
 }
 
 } // namespace zavctl

@@ -147,30 +147,30 @@ Answer add(Session &session, int slot, const ChangeOptions &options, const Conse
 
 } // namespace
 
-void add_disk_remove(CLI::App &disk, Session &session) {
+void add_disk_remove(Command disk, Session &session) {
     const auto slot = std::make_shared<int>(0);
     const auto consent = std::make_shared<Consent>();
-    CLI::App *verb = add_verb(disk, session, "remove", remove_help);
-    verb->add_option("N", *slot, "Number of the slot, from 1")->required();
-    verb->add_flag("--destroy-data", consent->destroy,
-                   "Destroy arrays without redundancy on the disk, with the volumes on them");
-    const auto options = add_change_options(*verb);
-    verb->callback([&session, slot, options, consent] {
+    const Command verb = add_verb(disk, session, "remove", remove_help);
+    verb.add_option("N", *slot, "Number of the slot, from 1").required();
+    verb.add_flag("--destroy-data", consent->destroy,
+                  "Destroy arrays without redundancy on the disk, with the volumes on them");
+    const auto options = add_change_options(verb);
+    verb.callback([&session, slot, options, consent] {
         session.action = [&session, slot, options, consent] {
             return remove(session, *slot, *options, *consent);
         };
     });
 }
 
-void add_disk_add(CLI::App &disk, Session &session) {
+void add_disk_add(Command disk, Session &session) {
     const auto slot = std::make_shared<int>(0);
     const auto consent = std::make_shared<Consent>();
-    CLI::App *verb = add_verb(disk, session, "add", add_help);
-    verb->add_option("N", *slot, "Number of the slot, from 1")->required();
-    verb->add_flag("--recreate", consent->recreate,
-                   "Create a lost data array anew; what it held is erased");
-    const auto options = add_change_options(*verb);
-    verb->callback([&session, slot, options, consent] {
+    const Command verb = add_verb(disk, session, "add", add_help);
+    verb.add_option("N", *slot, "Number of the slot, from 1").required();
+    verb.add_flag("--recreate", consent->recreate,
+                  "Create a lost data array anew; what it held is erased");
+    const auto options = add_change_options(verb);
+    verb.callback([&session, slot, options, consent] {
         session.action = [&session, slot, options, consent] {
             return add(session, *slot, *options, *consent);
         };

@@ -24,9 +24,9 @@ constexpr VerbHelp help = {
 
 } // namespace
 
-void add_doctor(CLI::App &root, Session &session) {
-    CLI::App *doctor = add_verb(root, session, "doctor", help);
-    doctor->callback([&session] {
+void add_doctor(Command root, Session &session) {
+    const Command doctor = add_verb(root, session, "doctor", help);
+    doctor.callback([&session] {
         session.action = [] {
             std::vector<Check> checks = platform_checks(read_platform(read_model()));
             for (const Check &check : driver_checks(read_drivers()))

@@ -136,55 +136,55 @@ Answer push(Session &session, const EventWords &given) {
     return {"event push", "", {pushed_section(pushed, path_of)}};
 }
 
-void add_poll(CLI::App &event, Session &session) {
+void add_poll(Command event, Session &session) {
     const auto all = std::make_shared<bool>(false);
     const auto is_private = std::make_shared<bool>(false);
-    CLI::App *verb = add_verb(event, session, "poll", poll_help);
-    verb->add_flag("--all", *all, "Take every event that is there");
-    add_private(*verb, *is_private);
-    verb->callback([&session, all, is_private] {
+    const Command verb = add_verb(event, session, "poll", poll_help);
+    verb.add_flag("--all", *all, "Take every event that is there");
+    add_private(verb, *is_private);
+    verb.callback([&session, all, is_private] {
         session.action = [all, is_private] { return poll(*all, *is_private); };
     });
 }
 
-void add_wait(CLI::App &root, CLI::App &event, Session &session) {
+void add_wait(Command event, Session &session) {
     const auto waiting = std::make_shared<Wait>();
-    CLI::App *verb = add_verb(event, session, "wait", wait_help);
-    add_private(*verb, waiting->is_private);
-    verb->callback([&root, verb, &session, waiting] {
-        if (verb->count("--timeout") + root.count("--timeout") > 0)
+    const Command verb = add_verb(event, session, "wait", wait_help);
+    add_private(verb, waiting->is_private);
+    verb.callback([verb, &session, waiting] {
+        if (verb.was_given("--timeout"))
             waiting->seconds = session.options.timeout;
         session.action = [waiting] { return wait(*waiting); };
     });
 }
 
-void add_push(CLI::App &event, Session &session) {
+void add_push(Command event, Session &session) {
     const auto given = std::make_shared<EventWords>();
-    CLI::App *verb = add_verb(event, session, "push", push_help);
-    verb->add_option("WORD", given->words, "What the event is about, or '-'")->required();
-    verb->add_option("--state", given->state, "State in words")->type_name("STATE");
-    verb->add_option("--value", given->value, "Reading, or use in percent")->type_name("NUMBER");
-    verb->add_option("--charge", given->charge, "Charge of the battery")->type_name("PERCENT");
-    verb->add_option("--progress", given->progress, "Progress of a rebuild")->type_name("PERCENT");
-    verb->add_option("--speed", given->speed, "Speed of a link")->type_name("MBIT");
-    verb->callback([&session, given] {
+    const Command verb = add_verb(event, session, "push", push_help);
+    verb.add_option("WORD", given->words, "What the event is about, or '-'").required();
+    verb.add_option("--state", given->state, "State in words").type_name("STATE");
+    verb.add_option("--value", given->value, "Reading, or use in percent").type_name("NUMBER");
+    verb.add_option("--charge", given->charge, "Charge of the battery").type_name("PERCENT");
+    verb.add_option("--progress", given->progress, "Progress of a rebuild").type_name("PERCENT");
+    verb.add_option("--speed", given->speed, "Speed of a link").type_name("MBIT");
+    verb.callback([&session, given] {
         session.action = [&session, given] { return push(session, *given); };
     });
 }
 
 } // namespace
 
-void add_private(CLI::App &verb, bool &is_private) {
+void add_private(Command verb, bool &is_private) {
     verb.add_flag("--private", is_private, "The driver's private queue");
 }
 
-void add_event(CLI::App &root, Session &session) {
-    CLI::App *event =
+void add_event(Command root, Session &session) {
+    const Command event =
         add_object(root, "event", "The event driver's queue: poll, wait, follow, push");
-    add_poll(*event, session);
-    add_wait(root, *event, session);
-    add_event_follow(*event, session);
-    add_push(*event, session);
+    add_poll(event, session);
+    add_wait(event, session);
+    add_event_follow(event, session);
+    add_push(event, session);
 }
 
 } // namespace zavctl

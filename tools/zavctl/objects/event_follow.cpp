@@ -120,11 +120,11 @@ class Follower {
 
 } // namespace
 
-void add_event_follow(CLI::App &event, Session &session) {
+void add_event_follow(Command event, Session &session) {
     const auto is_private = std::make_shared<bool>(false);
-    CLI::App *verb = add_verb(event, session, "follow", help);
-    add_private(*verb, *is_private);
-    verb->callback([&session, is_private] {
+    const Command verb = add_verb(event, session, "follow", help);
+    add_private(verb, *is_private);
+    verb.callback([&session, is_private] {
         session.program = [&session, is_private] {
             const StopGuard until_stopped;
             return Follower(session, *is_private).run();

@@ -5,9 +5,9 @@
 namespace zavctl {
 
 // The verb that goes on until it is stopped.
-void add_event_follow(CLI::App &event, Session &session);
+void add_event_follow(Command event, Session &session);
 
 // The option for the driver's other queue.
-void add_private(CLI::App &verb, bool &is_private);
+void add_private(Command verb, bool &is_private);
 
 } // namespace zavctl

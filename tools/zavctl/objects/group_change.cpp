@@ -205,31 +205,31 @@ Answer remove(Session &session, int group, bool system_group_too, const ChangeOp
 
 } // namespace
 
-void add_vg_add(CLI::App &vg, Session &session) {
+void add_vg_add(Command vg, Session &session) {
     const auto words = std::make_shared<std::vector<std::string>>();
     const auto group = std::make_shared<int>(0);
-    CLI::App *verb = add_verb(vg, session, "add", add_help);
-    verb->add_option("DEVICE", *words, "'array N', 'disk N', a path or an address")->required();
-    verb->add_option("--group", *group, "Number of the group, 0 is PrimaryOSVG")
-        ->required()
-        ->type_name("N")
-        ->check(CLI::Range(0, 9999));
-    const auto options = add_change_options(*verb);
-    verb->callback([&session, words, group, options] {
+    const Command verb = add_verb(vg, session, "add", add_help);
+    verb.add_option("DEVICE", *words, "'array N', 'disk N', a path or an address").required();
+    verb.add_option("--group", *group, "Number of the group, 0 is PrimaryOSVG")
+        .required()
+        .type_name("N")
+        .within(0, 9999);
+    const auto options = add_change_options(verb);
+    verb.callback([&session, words, group, options] {
         session.action = [&session, words, group, options] {
             return add(session, *words, *group, *options);
         };
     });
 }
 
-void add_vg_remove(CLI::App &vg, Session &session) {
+void add_vg_remove(Command vg, Session &session) {
     const auto group = std::make_shared<int>(0);
     const auto system_group = std::make_shared<bool>(false);
-    CLI::App *verb = add_verb(vg, session, "remove", remove_help);
-    verb->add_option("N", *group, "Number of the group")->required()->check(CLI::Range(0, 9999));
-    verb->add_flag("--system-group", *system_group, "Also PrimaryOSVG, the system's own group");
-    const auto options = add_change_options(*verb);
-    verb->callback([&session, group, system_group, options] {
+    const Command verb = add_verb(vg, session, "remove", remove_help);
+    verb.add_option("N", *group, "Number of the group").required().within(0, 9999);
+    verb.add_flag("--system-group", *system_group, "Also PrimaryOSVG, the system's own group");
+    const auto options = add_change_options(verb);
+    verb.callback([&session, group, system_group, options] {
         session.action = [&session, group, system_group, options] {
             return remove(session, *group, *system_group, *options);
         };

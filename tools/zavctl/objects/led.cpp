@@ -138,33 +138,33 @@ Answer poll() {
     return {"led poll", "", {led_alarm_section(alarm)}};
 }
 
-void add_get(CLI::App &led, Session &session) {
+void add_get(Command led, Session &session) {
     const auto words = std::make_shared<std::vector<std::string>>();
-    CLI::App *verb = add_verb(led, session, "get", get_help);
-    verb->add_option("LED", *words, "panel-1 to panel-6, disk-1 to disk-4, or 1 to 10");
-    verb->callback(
+    const Command verb = add_verb(led, session, "get", get_help);
+    verb.add_option("LED", *words, "panel-1 to panel-6, disk-1 to disk-4, or 1 to 10");
+    verb.callback(
         [&session, words] { session.action = [&session, words] { return get(session, *words); }; });
 }
 
-void add_set(CLI::App &led, Session &session) {
+void add_set(Command led, Session &session) {
     const auto name = std::make_shared<std::string>();
     const auto state = std::make_shared<std::string>();
-    CLI::App *verb = add_verb(led, session, "set", set_help);
-    verb->add_option("LED", *name, "panel-1 to panel-6, disk-1 to disk-4, or 1 to 10")->required();
-    verb->add_option("STATE", *state, "off, on, value2; first-on, second-on, ...")->required();
-    verb->callback(
+    const Command verb = add_verb(led, session, "set", set_help);
+    verb.add_option("LED", *name, "panel-1 to panel-6, disk-1 to disk-4, or 1 to 10").required();
+    verb.add_option("STATE", *state, "off, on, value2; first-on, second-on, ...").required();
+    verb.callback(
         [&session, name, state] { session.action = [name, state] { return set(*name, *state); }; });
 }
 
-void add_alarm(CLI::App &led, Session &session) {
+void add_alarm(Command led, Session &session) {
     const auto alarm = std::make_shared<LedAlarm>();
-    CLI::App *verb = add_verb(led, session, "alarm", alarm_help);
-    verb->add_option("--priority", alarm->priority, "Of the alarm, as the driver counts")
-        ->type_name("P")
-        ->required();
-    verb->add_option("--code", alarm->code, "Which alarm")->type_name("C")->required();
-    verb->add_option("--state", alarm->state, "Its state")->type_name("S")->required();
-    verb->callback([&session, alarm] {
+    const Command verb = add_verb(led, session, "alarm", alarm_help);
+    verb.add_option("--priority", alarm->priority, "Of the alarm, as the driver counts")
+        .type_name("P")
+        .required();
+    verb.add_option("--code", alarm->code, "Which alarm").type_name("C").required();
+    verb.add_option("--state", alarm->state, "Its state").type_name("S").required();
+    verb.callback([&session, alarm] {
         session.action = [alarm] {
             const int result = library::put_led_alarm(alarm->priority, alarm->code, alarm->state);
             return Answer{"led alarm",
@@ -177,12 +177,12 @@ void add_alarm(CLI::App &led, Session &session) {
 
 } // namespace
 
-void add_led(CLI::App &root, Session &session) {
-    CLI::App *led = add_object(root, "led", "LEDs and their alarms: get, set, alarm, poll");
-    add_get(*led, session);
-    add_set(*led, session);
-    add_alarm(*led, session);
-    add_verb(*led, session, "poll", poll_help)->callback([&session] { session.action = poll; });
+void add_led(Command root, Session &session) {
+    const Command led = add_object(root, "led", "LEDs and their alarms: get, set, alarm, poll");
+    add_get(led, session);
+    add_set(led, session);
+    add_alarm(led, session);
+    add_verb(led, session, "poll", poll_help).callback([&session] { session.action = poll; });
 }
 
 } // namespace zavctl

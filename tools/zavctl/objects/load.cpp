@@ -103,11 +103,11 @@ std::vector<Question> ask_load(bool processor, const Session &session,
     return questions;
 }
 
-void add_load(CLI::App &root, Session &session) {
+void add_load(Command root, Session &session) {
     const auto no_processor = std::make_shared<bool>(false);
-    CLI::App *verb = add_verb(root, session, "load", help);
-    verb->add_flag("--no-processor", *no_processor, "Do not measure the processor");
-    verb->callback([&session, no_processor] {
+    const Command verb = add_verb(root, session, "load", help);
+    verb.add_flag("--no-processor", *no_processor, "Do not measure the processor");
+    verb.callback([&session, no_processor] {
         session.action = [&session, no_processor] { return load(session, !*no_processor); };
     });
 }

@@ -51,10 +51,10 @@ Answer show(Session &session, const std::vector<std::string> &words) {
 
 } // namespace
 
-void add_lv(CLI::App &root, Session &session) {
-    CLI::App *lv = add_object(root, "lv", "The logical volumes: list, show");
-    add_list(*lv, session, list_help, list);
-    add_show<std::string>(*lv, session, show_help,
+void add_lv(Command root, Session &session) {
+    const Command lv = add_object(root, "lv", "The logical volumes: list, show");
+    add_list(lv, session, list_help, list);
+    add_show<std::string>(lv, session, show_help,
                           {"VOLUME", "GROUP-NUMBER, or the path of its device"}, show);
 }
 

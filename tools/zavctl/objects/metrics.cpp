@@ -50,15 +50,15 @@ int metrics(Session &session, const std::string &file, Processor processor) {
 
 } // namespace
 
-void add_metrics(CLI::App &root, Session &session) {
+void add_metrics(Command root, Session &session) {
     const auto file = std::make_shared<std::string>();
     const auto no_processor = std::make_shared<bool>(false);
-    CLI::App *verb = add_verb(root, session, "metrics", help);
-    verb->add_flag("--no-processor", *no_processor,
-                   "Leave the processor out, which takes 10 seconds to measure");
-    verb->add_option("--output", *file, "Write the file in one step, in place of standard output")
-        ->type_name("FILE");
-    verb->callback([&session, file, no_processor] {
+    const Command verb = add_verb(root, session, "metrics", help);
+    verb.add_flag("--no-processor", *no_processor,
+                  "Leave the processor out, which takes 10 seconds to measure");
+    verb.add_option("--output", *file, "Write the file in one step, in place of standard output")
+        .type_name("FILE");
+    verb.callback([&session, file, no_processor] {
         session.program = [&session, file, no_processor] {
             return metrics(session, *file,
                            *no_processor ? Processor::left_out : Processor::measured);

@@ -64,9 +64,9 @@ Machine read_machine() {
     return machine;
 }
 
-void add_model(CLI::App &root, Session &session) {
-    CLI::App *model = add_verb(root, session, "model", help);
-    model->callback([&session] {
+void add_model(Command root, Session &session) {
+    const Command model = add_verb(root, session, "model", help);
+    model.callback([&session] {
         session.action = [] { return Answer{"model", "", {model_section(read_model())}}; };
     });
 }

@@ -54,11 +54,11 @@ Answer name_answer(const std::vector<NameQuery> &queries) {
 
 } // namespace
 
-void add_name(CLI::App &root, Session &session) {
-    CLI::App *name = add_verb(root, session, "name", help);
+void add_name(Command root, Session &session) {
+    const Command name = add_verb(root, session, "name", help);
     const auto words = std::make_shared<std::vector<std::string>>();
-    name->add_option("WORD", *words, "Paths, and addresses TYPE MINOR NUMBER [PART]")->required();
-    name->callback([&session, words] {
+    name.add_option("WORD", *words, "Paths, and addresses TYPE MINOR NUMBER [PART]").required();
+    name.callback([&session, words] {
         session.action = [words] {
             try {
                 return name_answer(name_queries(*words));

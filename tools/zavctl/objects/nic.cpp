@@ -117,10 +117,10 @@ std::vector<Question> ask_nics(const std::vector<NicId> &nics, const Session &se
     });
 }
 
-void add_nic(CLI::App &root, Session &session) {
-    CLI::App *nic = add_object(root, "nic", "Ethernet ports and bonds: list, show");
-    add_list(*nic, session, list_help, list);
-    add_show<std::string>(*nic, session, show_help,
+void add_nic(Command root, Session &session) {
+    const Command nic = add_object(root, "nic", "Ethernet ports and bonds: list, show");
+    add_list(nic, session, list_help, list);
+    add_show<std::string>(nic, session, show_help,
                           {"NAME", "eth0 to eth3, bond0, bond1; or 1 to 4, which are eth0 to eth3"},
                           show);
 }

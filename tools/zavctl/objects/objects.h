@@ -3,6 +3,7 @@
 #pragma once
 
 #include "../core/model_report.h"
+#include "command.h"
 #include "session.h"
 
 #include <memory>
@@ -34,24 +35,24 @@ struct Survey {
 template <class Report>
 using Shared = std::shared_ptr<std::vector<Report>>;
 
-using AddObject = void (*)(CLI::App &root, Session &session);
+using AddObject = void (*)(Command root, Session &session);
 const std::vector<AddObject> &object_table();
 
-void add_status(CLI::App &root, Session &session);
-void add_model(CLI::App &root, Session &session);
-void add_disk(CLI::App &root, Session &session);
-void add_array(CLI::App &root, Session &session);
-void add_unit(CLI::App &root, Session &session);
-void add_report(CLI::App &root, Session &session);
-void add_vg(CLI::App &root, Session &session);
-void add_pv(CLI::App &root, Session &session);
-void add_lv(CLI::App &root, Session &session);
-void add_bios(CLI::App &root, Session &session);
-void add_name(CLI::App &root, Session &session);
-void add_event(CLI::App &root, Session &session);
-void add_watch(CLI::App &root, Session &session);
-void add_metrics(CLI::App &root, Session &session);
-void add_check(CLI::App &root, Session &session);
-void add_doctor(CLI::App &root, Session &session);
+void add_status(Command root, Session &session);
+void add_model(Command root, Session &session);
+void add_disk(Command root, Session &session);
+void add_array(Command root, Session &session);
+void add_unit(Command root, Session &session);
+void add_report(Command root, Session &session);
+void add_vg(Command root, Session &session);
+void add_pv(Command root, Session &session);
+void add_lv(Command root, Session &session);
+void add_bios(Command root, Session &session);
+void add_name(Command root, Session &session);
+void add_event(Command root, Session &session);
+void add_watch(Command root, Session &session);
+void add_metrics(Command root, Session &session);
+void add_check(Command root, Session &session);
+void add_doctor(Command root, Session &session);
 
 } // namespace zavctl

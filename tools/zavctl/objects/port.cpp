@@ -54,16 +54,16 @@ Answer set(const std::string &word) {
 
 } // namespace
 
-void add_port(CLI::App &root, Session &session) {
-    CLI::App *port = add_object(root, "port", "The digital sensor ports: get, set");
+void add_port(Command root, Session &session) {
+    const Command port = add_object(root, "port", "The digital sensor ports: get, set");
     const auto hex = std::make_shared<bool>(false);
-    CLI::App *get_verb = add_verb(*port, session, "get", get_help);
-    get_verb->add_flag("--hex", *hex, "Show the byte in hexadecimal alone");
-    get_verb->callback([&session, hex] { session.action = [hex] { return get(*hex); }; });
+    const Command get_verb = add_verb(port, session, "get", get_help);
+    get_verb.add_flag("--hex", *hex, "Show the byte in hexadecimal alone");
+    get_verb.callback([&session, hex] { session.action = [hex] { return get(*hex); }; });
     const auto byte = std::make_shared<std::string>();
-    CLI::App *set_verb = add_verb(*port, session, "set", set_help);
-    set_verb->add_option("BYTE", *byte, "0 to 255, or 0x00 to 0xFF")->required();
-    set_verb->callback([&session, byte] { session.action = [byte] { return set(*byte); }; });
+    const Command set_verb = add_verb(port, session, "set", set_help);
+    set_verb.add_option("BYTE", *byte, "0 to 255, or 0x00 to 0xFF").required();
+    set_verb.callback([&session, byte] { session.action = [byte] { return set(*byte); }; });
 }
 
 } // namespace zavctl

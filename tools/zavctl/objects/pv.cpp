@@ -53,10 +53,10 @@ Answer show(Session &session, const std::vector<std::string> &words) {
 
 } // namespace
 
-void add_pv(CLI::App &root, Session &session) {
-    CLI::App *pv = add_object(root, "pv", "The physical volumes: list, show");
-    add_list(*pv, session, list_help, list);
-    add_show<std::string>(*pv, session, show_help, {"VOLUME", "GROUP-NUMBER"}, show);
+void add_pv(Command root, Session &session) {
+    const Command pv = add_object(root, "pv", "The physical volumes: list, show");
+    add_list(pv, session, list_help, list);
+    add_show<std::string>(pv, session, show_help, {"VOLUME", "GROUP-NUMBER"}, show);
 }
 
 } // namespace zavctl

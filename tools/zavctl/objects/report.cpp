@@ -47,12 +47,12 @@ Answer check(const Session &session, const std::string &file) {
 
 } // namespace
 
-void add_report(CLI::App &root, Session &session) {
-    CLI::App *report = add_object(root, "report", "The RAID controller's report: check");
+void add_report(Command root, Session &session) {
+    const Command report = add_object(root, "report", "The RAID controller's report: check");
     const auto file = std::make_shared<std::string>(controller_report);
-    CLI::App *verb = add_verb(*report, session, "check", check_help);
-    verb->add_option("FILE", *file, "The report, or - for standard input");
-    verb->callback(
+    const Command verb = add_verb(report, session, "check", check_help);
+    verb.add_option("FILE", *file, "The report, or - for standard input");
+    verb.callback(
         [&session, file] { session.action = [&session, file] { return check(session, *file); }; });
 }
 

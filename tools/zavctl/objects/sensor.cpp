@@ -155,13 +155,13 @@ Answer reset_alarms(Session &session, const std::vector<std::string> &words, boo
     return {"sensor reset", "", {sensor_reset_section(*resets)}};
 }
 
-void add_reset(CLI::App &sensor, Session &session) {
+void add_reset(Command sensor, Session &session) {
     const auto words = std::make_shared<std::vector<std::string>>();
     const auto all = std::make_shared<bool>(false);
-    CLI::App *verb = add_verb(sensor, session, "reset", reset_help);
-    verb->add_option("SENSOR", *words, "Such as thermal-1 or volt-3");
-    verb->add_flag("--all", *all, "Every temperature and voltage of the main board");
-    verb->callback([&session, words, all] {
+    const Command verb = add_verb(sensor, session, "reset", reset_help);
+    verb.add_option("SENSOR", *words, "Such as thermal-1 or volt-3");
+    verb.add_flag("--all", *all, "Every temperature and voltage of the main board");
+    verb.callback([&session, words, all] {
         session.action = [&session, words, all] { return reset_alarms(session, *words, *all); };
     });
 }
@@ -186,13 +186,13 @@ std::vector<Question> ask_sensors(const std::vector<const Sensor *> &sensors,
     });
 }
 
-void add_sensor(CLI::App &root, Session &session) {
-    CLI::App *sensor =
+void add_sensor(Command root, Session &session) {
+    const Command sensor =
         add_object(root, "sensor", "Temperatures, voltages, fans: list, show, reset");
-    add_list(*sensor, session, list_help, list);
-    add_show<std::string>(*sensor, session, show_help,
+    add_list(sensor, session, list_help, list);
+    add_show<std::string>(sensor, session, show_help,
                           {"SENSOR", "thermal-1 to -4, volt-1 to -5, fan-1 to -4"}, show);
-    add_reset(*sensor, session);
+    add_reset(sensor, session);
 }
 
 } // namespace zavctl

@@ -5,8 +5,6 @@
 #include "../system/ask.h"
 #include "../system/streams.h"
 
-#include <CLI/CLI.hpp>
-
 #include <functional>
 #include <stdexcept>
 #include <string>
@@ -42,21 +40,5 @@ class UsageError : public std::runtime_error {
 
 // The default of a report: no answer within the time limit.
 Failure no_answer(const Session &session);
-
-// What a verb's help says besides its options.
-struct VerbHelp {
-    const char *summary;  // one line
-    const char *shown;    // what the screen shows, and what each exit status means here
-    const char *examples; // command lines, one per line, indented
-};
-
-// Adds a verb with the output options that every verb has.
-CLI::App *add_verb(CLI::App &object, Session &session, const std::string &name,
-                   const VerbHelp &help);
-
-// Adds an object, which has verbs.
-CLI::App *add_object(CLI::App &root, const std::string &name, const std::string &summary);
-
-void add_output_options(CLI::App &app, Session &session);
 
 } // namespace zavctl

@@ -24,9 +24,9 @@ constexpr VerbHelp help = {
 
 } // namespace
 
-void add_status(CLI::App &root, Session &session) {
-    CLI::App *verb = add_verb(root, session, "status", help);
-    verb->callback(
+void add_status(Command root, Session &session) {
+    const Command verb = add_verb(root, session, "status", help);
+    verb.callback(
         [&session] { session.action = [&session] { return ask_appliance(session, "status"); }; });
 }
 

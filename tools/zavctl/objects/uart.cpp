@@ -56,16 +56,16 @@ Answer sync(const Session &session) {
 
 } // namespace
 
-void add_uart(CLI::App &root, Session &session) {
+void add_uart(Command root, Session &session) {
     const auto mode = std::make_shared<int>(0);
-    CLI::App *verb = add_verb(root, session, "uart", uart_help);
-    verb->add_option("MODE", *mode, "1 to 4")->required()->check(CLI::Range(1, 4));
-    verb->callback([&session, mode] { session.action = [mode] { return uart(*mode); }; });
+    const Command verb = add_verb(root, session, "uart", uart_help);
+    verb.add_option("MODE", *mode, "1 to 4").required().within(1, 4);
+    verb.callback([&session, mode] { session.action = [mode] { return uart(*mode); }; });
 }
 
-void add_sync(CLI::App &root, Session &session) {
-    CLI::App *verb = add_verb(root, session, "sync", sync_help);
-    verb->callback([&session] { session.action = [&session] { return sync(session); }; });
+void add_sync(Command root, Session &session) {
+    const Command verb = add_verb(root, session, "sync", sync_help);
+    verb.callback([&session] { session.action = [&session] { return sync(session); }; });
 }
 
 } // namespace zavctl

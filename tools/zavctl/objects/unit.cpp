@@ -95,13 +95,13 @@ Answer unknown_model(const char *command, const Machine &machine) {
     return {command, "", {std::move(section)}};
 }
 
-void add_unit(CLI::App &root, Session &session) {
-    CLI::App *unit = add_object(root, "unit", "The expansion units: list, show, check, mark");
-    add_list(*unit, session, list_help, list);
-    add_show<int>(*unit, session, show_help, {"N", "Number of the unit, 1 to 7"}, show)
-        ->check(CLI::Range(1, last_unit));
-    add_unit_check(*unit, session);
-    add_unit_mark(*unit, session);
+void add_unit(Command root, Session &session) {
+    const Command unit = add_object(root, "unit", "The expansion units: list, show, check, mark");
+    add_list(unit, session, list_help, list);
+    add_show<int>(unit, session, show_help, {"N", "Number of the unit, 1 to 7"}, show)
+        .within(1, last_unit);
+    add_unit_check(unit, session);
+    add_unit_mark(unit, session);
 }
 
 } // namespace zavctl

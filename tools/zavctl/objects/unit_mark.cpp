@@ -107,24 +107,22 @@ Answer mark(Session &session, int number, ChangeOptions options) {
 
 } // namespace
 
-void add_unit_mark(CLI::App &unit, Session &session) {
+void add_unit_mark(Command unit, Session &session) {
     const auto number = std::make_shared<int>(0);
-    CLI::App *verb = add_verb(unit, session, "mark", mark_help);
-    verb->add_option("N", *number, "Number of the unit, 1 to 7")
-        ->required()
-        ->check(CLI::Range(1, last_unit));
-    const auto options = add_change_options(*verb);
-    verb->callback([&session, number, options] {
+    const Command verb = add_verb(unit, session, "mark", mark_help);
+    verb.add_option("N", *number, "Number of the unit, 1 to 7").required().within(1, last_unit);
+    const auto options = add_change_options(verb);
+    verb.callback([&session, number, options] {
         session.action = [&session, number, options] { return mark(session, *number, *options); };
     });
 }
 
-void add_unit_check(CLI::App &unit, Session &session) {
+void add_unit_check(Command unit, Session &session) {
     const auto numbers = std::make_shared<std::vector<int>>();
-    CLI::App *verb = add_verb(unit, session, "check", check_help);
-    verb->add_option("N", *numbers, "Numbers of units, 1 to 7; all that are there without it")
-        ->check(CLI::Range(1, last_unit));
-    verb->callback([&session, numbers] {
+    const Command verb = add_verb(unit, session, "check", check_help);
+    verb.add_option("N", *numbers, "Numbers of units, 1 to 7; all that are there without it")
+        .within(1, last_unit);
+    verb.callback([&session, numbers] {
         session.action = [&session, numbers] { return check(session, *numbers); };
     });
 }

@@ -11,7 +11,7 @@ bool may_have_units(const Machine &machine);
 // What is said of the units of a model that is not known.
 Answer unknown_model(const char *command, const Machine &machine);
 
-void add_unit_mark(CLI::App &unit, Session &session);
-void add_unit_check(CLI::App &unit, Session &session);
+void add_unit_mark(Command unit, Session &session);
+void add_unit_check(Command unit, Session &session);
 
 } // namespace zavctl

@@ -86,9 +86,9 @@ std::vector<Question> ask_ups(const Session &session, const Shared<UpsReport> &r
     return {question("the UPS", begin, reports, asked)};
 }
 
-void add_ups(CLI::App &root, Session &session) {
-    CLI::App *verb = add_verb(root, session, "ups", help);
-    verb->callback([&session] { session.action = [&session] { return ups(session); }; });
+void add_ups(Command root, Session &session) {
+    const Command verb = add_verb(root, session, "ups", help);
+    verb.callback([&session] { session.action = [&session] { return ups(session); }; });
 }
 
 } // namespace zavctl

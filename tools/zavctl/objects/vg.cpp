@@ -40,19 +40,19 @@ Answer group_answer(Session &session, const Machine &machine, const std::vector<
 
 } // namespace
 
-void add_vg(CLI::App &root, Session &session) {
-    CLI::App *vg = add_object(root, "vg", "The volume groups: list, show, add, remove");
-    add_list(*vg, session, list_help, [](Session &asking) {
+void add_vg(Command root, Session &session) {
+    const Command vg = add_object(root, "vg", "The volume groups: list, show, add, remove");
+    add_list(vg, session, list_help, [](Session &asking) {
         const Machine machine = read_machine();
         return group_answer(asking, machine, listed_groups(machine), "vg list");
     });
-    add_show<int>(*vg, session, show_help, {"N", "Number of the group, 0 is PrimaryOSVG"},
+    add_show<int>(vg, session, show_help, {"N", "Number of the group, 0 is PrimaryOSVG"},
                   [](Session &asking, const std::vector<int> &numbers) {
                       return group_answer(asking, read_machine(), numbers, "vg show");
                   })
-        ->check(CLI::NonNegativeNumber);
-    add_vg_add(*vg, session);
-    add_vg_remove(*vg, session);
+        .not_negative();
+    add_vg_add(vg, session);
+    add_vg_remove(vg, session);
 }
 
 } // namespace zavctl

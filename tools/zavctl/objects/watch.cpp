@@ -142,20 +142,20 @@ class Watch {
 
 } // namespace
 
-void add_watch(CLI::App &root, Session &session) {
+void add_watch(Command root, Session &session) {
     const auto options = std::make_shared<WatchOptions>();
-    CLI::App *verb = add_verb(root, session, "watch", help);
-    verb->add_option("--interval", options->interval,
-                     "Seconds from the beginning of a round to that of the next; 5 if not given")
-        ->type_name("SECONDS")
-        ->check(CLI::Range(1, 86400));
-    verb->add_option("--rounds", options->rounds, "End after so many rounds")
-        ->type_name("N")
-        ->check(CLI::Range(1, 1000000));
-    verb->add_flag("--push", options->push, "Push every change to the event driver");
-    verb->add_flag("--until-change", options->until_change,
-                   "End after the first round in which something changed");
-    verb->callback([&session, options] {
+    const Command verb = add_verb(root, session, "watch", help);
+    verb.add_option("--interval", options->interval,
+                    "Seconds from the beginning of a round to that of the next; 5 if not given")
+        .type_name("SECONDS")
+        .within(1, 86400);
+    verb.add_option("--rounds", options->rounds, "End after so many rounds")
+        .type_name("N")
+        .within(1, 1000000);
+    verb.add_flag("--push", options->push, "Push every change to the event driver");
+    verb.add_flag("--until-change", options->until_change,
+                  "End after the first round in which something changed");
+    verb.callback([&session, options] {
         session.program = [&session, options] { return Watch(session, *options).run(); };
     });
 }
