@@ -88,7 +88,7 @@ Choice expected(int type, int state, int session) {
 TEST(BurnChoice, IsMadeForEveryDiscStateAndSession) {
     for (int type = ZAV_DVD_ROM; type <= ZAV_DISC_UNKNOWN; ++type)
         for (int state = ZAV_DISC_BLANK; state <= ZAV_DISC_STATE_UNKNOWN; ++state)
-            for (const int session : {0, 1, 2, 3, -1, 1000})
+            for (const int session : {0, 1, 2, 3, 4, 5, -1, 1000})
                 EXPECT_EQ(choose(type, state, session), expected(type, state, session))
                     << "type " << type << " state " << state << " session " << session;
 }
@@ -126,6 +126,12 @@ TEST(BurnRoom, IsWhatIsLeftForAFurtherSession) {
     EXPECT_FALSE(zav::has_room(disc, 1, 501));
     disc.discAvailableSize = -1;
     EXPECT_FALSE(zav::has_room(disc, 1, 0));
+}
+
+TEST(BurnRoom, IsThereForAnEmptySourceOnAFullDisc) {
+    const zavMediaInfo disc = {ZAV_EVENT_DISC, ZAV_DVD_PLUS_R, ZAV_DISC_APPENDABLE, 0, 0};
+    for (const int session : {0, 1, 2})
+        EXPECT_TRUE(zav::has_room(disc, session, 0));
 }
 
 TEST(BurnRoom, IsNotAskedForOtherSessions) {

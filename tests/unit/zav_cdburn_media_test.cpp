@@ -88,6 +88,12 @@ TEST_F(Media, AppendableDvdHasWhatItsSectorsLeave) {
     expect(ZAV_DVD_MINUS_R_SEQ, ZAV_DISC_APPENDABLE, 4590000, 4590000 - 2000 - 4096);
 }
 
+TEST_F(Media, DvdWithoutSectorsHasAllButTheReserve) {
+    dvd(" Mounted Media:         1Bh, DVD+R\n Disc status:           appendable\n"
+        "READ CAPACITY:          0*2048=0\n");
+    expect(ZAV_DVD_PLUS_R, ZAV_DISC_APPENDABLE, 4590000, 4590000 - 4096);
+}
+
 TEST_F(Media, RoomOfADvdMayBeNegative) {
     dvd(" Mounted Media:         11h, DVD-R Sequential\n Disc status:           appendable\n"
         "READ CAPACITY:          2295000*2048=4700160000\n");
