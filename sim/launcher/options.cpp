@@ -50,6 +50,8 @@ constexpr const char *footer =
     "  port N loses its link | gets its link | runs at 100\n"
     "  bond fails over\n"
     "  event fan N | thermal N | voltage N | ups | disk N | array N | port N\n"
+    "  drive gets blank | appendable | complete | unknown MEDIUM [with N MB used]\n"
+    "  drive loses its disc | is a combo | is a burner | writes at N | vanishes | appears\n"
     "  tool NAME hangs 30s | prints \"TEXT\" | exits N | is missing | works again";
 
 class HelpPage : public CLI::Formatter {

@@ -25,6 +25,7 @@ struct Action {
         tool_hangs,
         tool_prints,
         tool_exits,
+        tool_fails,
         tool_is_missing,
         tool_works,
         raid_volume_degrades,
@@ -67,7 +68,14 @@ struct Action {
         port_gets_link,
         port_runs,
         bond_fails_over,
-        event_is_put
+        event_is_put,
+        drive_gets_disc,
+        drive_loses_disc,
+        drive_is_combo,
+        drive_is_burner,
+        drive_writes,
+        drive_vanishes,
+        drive_appears
     };
     Kind kind = Kind::disk_fails;
     int number = 0;   // disk, array, volume, sensor, fan or port, counted from 1

@@ -6,6 +6,7 @@
 #include "model/disks.hpp"
 #include "model/driver_events.hpp"
 #include "model/health_actions.hpp"
+#include "model/optical.hpp"
 #include "model/sentences.hpp"
 #include "model/volumes.hpp"
 
@@ -203,7 +204,7 @@ ToolFault &fault_of(State &state, const std::string &tool) {
     for (ToolFault &fault : state.faults)
         if (fault.tool == tool)
             return fault;
-    state.faults.push_back({tool, 0, std::nullopt, std::nullopt, false});
+    state.faults.push_back({tool, 0, std::nullopt, std::nullopt, std::nullopt, false});
     return state.faults.back();
 }
 
@@ -215,10 +216,12 @@ void act_on_tool(State &state, const Action &action) {
         fault.prints = action.text;
     else if (action.kind == Action::Kind::tool_exits)
         fault.exits = action.status;
+    else if (action.kind == Action::Kind::tool_fails)
+        fault.fails_at = action.percent;
     else if (action.kind == Action::Kind::tool_is_missing)
         fault.missing = true;
     else
-        fault = ToolFault{action.tool, 0, std::nullopt, std::nullopt, false};
+        fault = ToolFault{action.tool, 0, std::nullopt, std::nullopt, std::nullopt, false};
 }
 
 bool is_about_disk(Action::Kind kind) {
@@ -239,6 +242,8 @@ bool is_about_controller(const State &state, const Action &action) {
 } // namespace
 
 std::string perform(State &state, const Action &action) {
+    if (is_about_drive(action.kind))
+        return act_on_drive(state, action);
     if (is_about_health(action.kind))
         return act_on_health(state, action);
     if (is_about_controller(state, action))
@@ -268,6 +273,9 @@ void scsi_command(State &state, const std::string &line) {
     int host = -1;
     if (!(in >> name >> verb >> host) || name != "scsi")
         return;
+    if (host == optical_host && state.drive.present && !state.drive.job)
+        state.drive.attached =
+            verb == "add-single-device" || (state.drive.attached && verb != "remove-single-device");
     for (Disk &disk : state.disks) {
         if (disk.host != host || !disk.inserted)
             continue;

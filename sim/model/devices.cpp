@@ -63,6 +63,15 @@ void add_enclosure(std::vector<Node> &nodes, const Enclosure &enclosure) {
             {fmt::format("{}{}", volumes, volume.number), {}, enclosure_node_bytes, volume.serial});
 }
 
+// The node itself is empty: what a disc holds cannot be read from it.
+void add_drive(std::vector<Node> &nodes, const OpticalDrive &drive) {
+    nodes.push_back({"/dev/sr0", {}, 0, 0});
+    for (const char *link : {"/dev/scd0", "/dev/cdrom"})
+        nodes.push_back({link, "sr0", 0, 0});
+    if (drive.packet_device)
+        nodes.push_back({"/dev/pktcdvd/pktcdvd0", {}, 0, 0});
+}
+
 // Where a name of its own has a hyphen device-mapper writes two.
 std::string doubled_hyphens(const std::string &name) {
     std::string text;
@@ -86,6 +95,8 @@ std::vector<Node> device_nodes(const State &state) {
                 add_volume(nodes, group, volume);
     for (const Enclosure *enclosure : reached_enclosures(state))
         add_enclosure(nodes, *enclosure);
+    if (drive_answers(state.drive))
+        add_drive(nodes, state.drive);
     return nodes;
 }
 

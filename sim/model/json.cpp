@@ -64,7 +64,7 @@ NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(Enclosure, number, present, linked, model, se
                                    set_name, bays, volumes, readings)
 NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(Controller, enclosures, report_fault, slow_rewrites,
                                    rewrite_seconds)
-NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(ToolFault, tool, hangs, prints, exits, missing)
+NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(ToolFault, tool, hangs, prints, exits, fails_at, missing)
 NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(Event, at, sentence)
 NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(Probe, value, status, missing)
 NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(Sensors, temperatures, voltages, fans, input)
@@ -75,12 +75,39 @@ NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(Ups, silent, on_battery, charge, since, statu
 NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(Port, link, speed, failures)
 NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(Network, ports, bonded, active)
 NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(DriverEvent, kind, number, value, state)
+NLOHMANN_JSON_SERIALIZE_ENUM(MediumType,
+                             {{MediumType::cd_rom, "CD-ROM"},
+                              {MediumType::cd_r, "CD-R"},
+                              {MediumType::cd_rw, "CD-RW"},
+                              {MediumType::dvd_rom, "DVD-ROM"},
+                              {MediumType::dvd_minus_r, "DVD-R"},
+                              {MediumType::dvd_ram, "DVD-RAM"},
+                              {MediumType::dvd_minus_rw_restricted, "DVD-RW restricted"},
+                              {MediumType::dvd_minus_rw_sequential, "DVD-RW sequential"},
+                              {MediumType::dvd_plus_rw, "DVD+RW"},
+                              {MediumType::dvd_plus_r, "DVD+R"},
+                              {MediumType::dvd_plus_r_double, "DVD+R double"}})
+NLOHMANN_JSON_SERIALIZE_ENUM(DiscState, {{DiscState::blank, "blank"},
+                                         {DiscState::appendable, "appendable"},
+                                         {DiscState::complete, "complete"},
+                                         {DiscState::unknown, "unknown"}})
+NLOHMANN_JSON_SERIALIZE_ENUM(DiscJobKind, {{DiscJobKind::write, "write"},
+                                           {DiscJobKind::overwrite, "overwrite"},
+                                           {DiscJobKind::erase, "erase"},
+                                           {DiscJobKind::format, "format"},
+                                           {DiscJobKind::empty, "empty"}})
+NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(DiscFile, path, bytes)
+NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(DiscSession, start, sectors, complete, merges, files)
+NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(Medium, type, state, sessions)
+NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(DiscJob, tool, process, kind, started, seconds, closes, session)
+NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(OpticalDrive, present, attached, combo, speed, packet_device,
+                                   medium, job)
 NLOHMANN_DEFINE_TYPE_NON_INTRUSIVE(State, model, data_level, current_tools, hosts_below_ata,
                                    time_scale, real_start, now, rebuild_kib_per_second, next_serial,
                                    next_sync_order, next_id, disks, arrays, stopped,
                                    physical_volumes, groups, controller, sensors, registers, load,
-                                   ups, network, known_states, driver_events, faults, scenario,
-                                   scsi_hosts, notes)
+                                   ups, network, drive, known_states, driver_events, faults,
+                                   scenario, scsi_hosts, notes)
 
 std::string to_text(const State &state) {
     // A garbled tool text may hold any bytes.

@@ -71,4 +71,6 @@ Sentence about_port(const std::vector<Word> &words);
 Sentence about_bond(const std::vector<Word> &words);
 Sentence about_event(const std::vector<Word> &words);
 
+Sentence about_drive(const std::vector<Word> &words);
+
 } // namespace zavsim

@@ -6,6 +6,7 @@
 #include <array>
 #include <fmt/format.h>
 #include <optional>
+#include <set>
 #include <sstream>
 
 namespace zavsim {
@@ -87,9 +88,22 @@ Sentence tool_state(Action action, const Word &verb_word, const Word &object_wor
         action.status = *whole_number(object, 0, 255);
     } else {
         return wrong(fmt::format(
-            "tool {} hangs 30s, prints \"text\", exits N (0 to 255), is missing or works again",
+            "tool {} hangs 30s, prints \"text\", exits N (0 to 255), is missing or works again; a "
+            "disc tool also fails at N%",
             action.tool));
     }
+    return {action, {}};
+}
+
+// Of tools that work on for a while.
+Sentence failing_tool(Action action, const std::string &how_far) {
+    static const std::set<std::string> lengthy = {
+        "growisofs", "mkisofs", "cdrecord", "dvd+rw-format", "mkudffs", "cdrwtool", "pktsetup"};
+    const auto percent = percentage(how_far);
+    if (!percent || lengthy.count(action.tool) == 0)
+        return wrong(fmt::format("only {} fail at N% (0 to 100)", fmt::join(lengthy, ", ")));
+    action.kind = Action::Kind::tool_fails;
+    action.percent = *percent;
     return {action, {}};
 }
 
@@ -98,6 +112,8 @@ Sentence about_tool(const std::vector<Word> &words) {
         return wrong(fmt::format("tool wants one of: {}", fmt::join(known_tools(), ", ")));
     Action action;
     action.tool = words[1].text;
+    if (words.size() == 5 && words[2].text == "fails" && words[3].text == "at")
+        return failing_tool(action, words[4].text);
     return words.size() == 4 ? tool_state(action, words[2], words[3]) : tool_state(action, {}, {});
 }
 
@@ -106,7 +122,7 @@ struct Noun {
     Sentence (*read)(const std::vector<Word> &words);
 };
 
-constexpr std::array<Noun, 20> nouns = {{{"disk", about_disk},
+constexpr std::array<Noun, 21> nouns = {{{"disk", about_disk},
                                          {"array", about_array},
                                          {"volume", about_volume},
                                          {"controller", about_controller},
@@ -125,6 +141,7 @@ constexpr std::array<Noun, 20> nouns = {{{"disk", about_disk},
                                          {"port", about_port},
                                          {"bond", about_bond},
                                          {"event", about_event},
+                                         {"drive", about_drive},
                                          {"tool", about_tool}}};
 
 std::string list_of_nouns() {
@@ -177,12 +194,26 @@ std::string quoted(const std::string &word) {
 } // namespace
 
 const std::vector<std::string> &known_tools() {
-    static const std::vector<std::string> tools = {
-        "mdadm",       "smartctl",  "mknod",       "vgs",          "lvs",      "pvs",
-        "vgdisplay",   "lvdisplay", "pvdisplay",   "vgcreate",     "vgextend", "vgremove",
-        "vgcfgbackup", "vgchange",  "lvcreate",    "lvremove",     "lvchange", "pvcreate",
-        "pvremove",    "udevinfo",  "sfdisk",      "dd",           "df",       "mount",
-        "umount",      "mkfs.ext4", "hbqSetup.sh", "query_sas.sh", "ethtool"};
+    static const std::vector<std::string> tools = {"mdadm",       "smartctl",
+                                                   "mknod",       "vgs",
+                                                   "lvs",         "pvs",
+                                                   "vgdisplay",   "lvdisplay",
+                                                   "pvdisplay",   "vgcreate",
+                                                   "vgextend",    "vgremove",
+                                                   "vgcfgbackup", "vgchange",
+                                                   "lvcreate",    "lvremove",
+                                                   "lvchange",    "pvcreate",
+                                                   "pvremove",    "udevinfo",
+                                                   "sfdisk",      "dd",
+                                                   "df",          "mount",
+                                                   "umount",      "mkfs.ext4",
+                                                   "hbqSetup.sh", "query_sas.sh",
+                                                   "ethtool",     "dvd+rw-mediainfo",
+                                                   "cdrecord",    "mkisofs",
+                                                   "growisofs",   "dvd+rw-format",
+                                                   "cdrwtool",    "pktsetup",
+                                                   "mkudffs",     "killall",
+                                                   "du"};
     return tools;
 }
 

@@ -3,6 +3,7 @@
 #pragma once
 
 #include "model/health.hpp"
+#include "model/optical.hpp"
 
 #include <cstdint>
 #include <map>
@@ -185,6 +186,7 @@ struct ToolFault {
     double hangs = 0; // appliance seconds, each run
     std::optional<std::string> prints;
     std::optional<int> exits;
+    std::optional<int> fails_at; // percent of its work
     bool missing = false;
 };
 
@@ -216,6 +218,7 @@ struct State {
     Load load;
     Ups ups;
     Network network;
+    OpticalDrive drive;
     std::map<std::string, int> known_states; // that the driver last saw, by kind and number
     std::vector<DriverEvent> driver_events;  // that are not in the driver's queue yet
     std::vector<ToolFault> faults;

@@ -2,6 +2,7 @@
 #include "model/devices.hpp"
 #include "model/disks.hpp"
 #include "model/load.hpp"
+#include "model/texts_optical.hpp"
 #include "model/texts_volumes.hpp"
 #include "model/volumes.hpp"
 
@@ -135,7 +136,7 @@ std::string mtab_text(const State &state) {
         text += fmt::format("{} {} ext4 rw,relatime{} 0 0\n",
                             mapper_path(*mounted.group, *mounted.volume),
                             mounted.volume->mount_point, stripe_option(state, *mounted.volume));
-    return text;
+    return text + disc_mount_text(state);
 }
 
 std::string df_text(const State &state) {

@@ -7,6 +7,7 @@
 #include "model/texts.hpp"
 #include "model/texts_volumes.hpp"
 #include "root/files.hpp"
+#include "root/optical_files.hpp"
 #include "root/report.hpp"
 #include "root/ups_files.hpp"
 #include "tools/tools.hpp"
@@ -219,6 +220,7 @@ bool publish(const State &state, const Taken &taken) {
     publish_load(state);
     publish_ups(state);
     publish_network(state);
+    publish_drive(state);
     const bool shown = publish_report(state);
     // The last: who waits for a command to be done looks for the list in its place.
     publish_scsi(scsi_text(state), taken.scsi_command);

@@ -9,6 +9,7 @@
 #include "model/sentences.hpp"
 #include "root/clock.hpp"
 #include "root/driver_queue.hpp"
+#include "root/optical_files.hpp"
 
 #include <cerrno>
 #include <fcntl.h>
@@ -50,6 +51,7 @@ std::string take_scsi_command(State &state) {
 
 Turn::Turn() : lock_(open_locked()), state_(load()) {
     advance(state_, (machine_seconds() - state_.real_start) * state_.time_scale);
+    notice_ended_job(state_);
     taken_ = {take_scsi_command(state_), take_driver_files(state_)};
 }
 

@@ -18,6 +18,8 @@ enum request {
     request_count = 0x20
 };
 
+enum { cdrom_requests = 0x53 }; /* the kernel's, which share their upper byte */
+
 struct device {
     const char *path;
     struct shim_queue queue;
@@ -136,5 +138,7 @@ SHIM_EXPORT int ioctl(int fd, unsigned long request, ...) {
     const struct device *device = request <= request_count ? device_of(fd) : NULL;
     if (device != NULL)
         return serve(device, request, argument);
+    if (request >> 8 == cdrom_requests && shim_is_drive(fd))
+        return shim_serve_drive(request, argument);
     return (int)syscall(SYS_ioctl, fd, request, argument);
 }

@@ -20,6 +20,10 @@ int shim_queue_put(const struct shim_queue *queue, const void *record);
 int shim_queue_take(const struct shim_queue *queue, void *record);
 int shim_queue_count(const struct shim_queue *queue);
 
+/* Requests of the optical drive; 0, or -1 with errno. */
+int shim_is_drive(int fd);
+int shim_serve_drive(unsigned long request, void *argument);
+
 /* Calls that do not pass through the functions that this library stands in for. */
 int shim_real_open(const char *path, int flags, int mode);
 int shim_real_close(int fd);

@@ -41,6 +41,11 @@ int run_setup_script(const std::vector<std::string> &words);
 int run_query_sas(const std::vector<std::string> &words);
 int run_ethtool(const std::vector<std::string> &words);
 
+int run_mediainfo(const std::vector<std::string> &words);
+int run_cdrecord(const std::vector<std::string> &words);
+int run_du(const std::vector<std::string> &words);
+int run_killall(const std::vector<std::string> &words);
+
 int run_act(const std::vector<std::string> &words);
 int run_state(const std::vector<std::string> &words);
 

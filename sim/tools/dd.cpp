@@ -1,10 +1,10 @@
 // dd: on a device node what it writes is the model's business as well; elsewhere the host's own.
-#include "launcher/sandbox.hpp"
 #include "model/arrays.hpp"
 #include "model/contents.hpp"
 #include "root/store.hpp"
 #include "tools/command.hpp"
 #include "tools/device_argument.hpp"
+#include "tools/host_program.hpp"
 
 #include <algorithm>
 #include <array>
@@ -194,20 +194,6 @@ int copy_to_device(const Copy &copy) {
     return count.full ? 1 : 0;
 }
 
-int exec_host_dd(const std::vector<std::string> &words) {
-    std::vector<std::string> copy = {"dd"};
-    copy.insert(copy.end(), words.begin(), words.end());
-    std::vector<char *> pointers;
-    pointers.reserve(copy.size() + 1);
-    for (std::string &word : copy)
-        pointers.push_back(word.data());
-    pointers.push_back(nullptr);
-    for (const std::string &program :
-         {place::host_usr + "/bin/dd", std::string("/run/host/bin/dd")})
-        execv(program.c_str(), pointers.data());
-    return complain("this machine has no dd of its own");
-}
-
 bool is_device(const std::string &path) {
     std::error_code error;
     const std::filesystem::path node = std::filesystem::canonical(path, error);
@@ -226,7 +212,7 @@ int run_dd(const std::vector<std::string> &words) {
     const Operands operands = operands_of(words);
     const auto to = operands.find("of");
     if (to == operands.end() || !is_device(to->second))
-        return exec_host_dd(words);
+        return exec_host_program("dd", words);
     const Copy copy = copy_of(operands);
     return copy.problem.empty() ? copy_to_device(copy) : complain(copy.problem);
 }

@@ -80,7 +80,11 @@ const std::vector<Tool> &simulated_tools() {
         {"mkfs.ext4", "/usr/sbin/mkfs.ext4", run_mkfs},
         {"hbqSetup.sh", "/usr/bin/hbqSetup.sh", run_setup_script},
         {"query_sas.sh", "/usr/bin/query_sas.sh", run_query_sas},
-        {"ethtool", "/usr/sbin/ethtool", run_ethtool}};
+        {"ethtool", "/usr/sbin/ethtool", run_ethtool},
+        {"dvd+rw-mediainfo", "/usr/bin/dvd+rw-mediainfo", run_mediainfo},
+        {"cdrecord", "/usr/bin/cdrecord", run_cdrecord},
+        {"killall", "/usr/bin/killall", run_killall},
+        {"du", "/usr/bin/du", run_du}};
     return tools;
 }
 
