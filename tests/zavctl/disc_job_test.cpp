@@ -78,6 +78,7 @@ TEST(JobProgress, WhatAnEarlierJobLeftIsNoProgress) {
     EXPECT_EQ(section.records["running"], false);
     EXPECT_TRUE(section.records["percent"].is_null());
     EXPECT_EQ(section.records["left_percent"], 100);
+    EXPECT_EQ(summary_of(progress_section({})), "OK: no tool of the burner runs");
 }
 
 TEST(JobCancel, TellsWhatWasStoppedAndWhatStillRuns) {

@@ -76,7 +76,7 @@ TEST(BurnPlan, TellsTheRoomAndWhatCounts) {
     EXPECT_EQ(done_by(plan), (Words{"measure", "burn", "append"}));
     EXPECT_EQ(plan.steps[0].text, "room: 700000 KiB (683.6 MiB) in all, 300000 KiB (293.0 MiB) "
                                   "free; the free room counts");
-    EXPECT_EQ(plan.steps[1].text, "what /srv/export (2048 KiB (2.0 MiB)) holds is burned into the "
+    EXPECT_EQ(plan.steps[1].text, "what /srv/export holds, 2048 KiB (2.0 MiB), is burned into the "
                                   "root of the disc; of a link, what it leads to");
 }
 

@@ -20,6 +20,14 @@ Json tools_json(const std::vector<RunningTool> &tools) {
     return json;
 }
 
+std::string progress_text(const ProgressReport &report) {
+    if (!report.running.empty())
+        return fmt::format("{} %, running: {}", report.percent.value_or(0),
+                           tools_words(report.running));
+    const std::string none = "no tool of the burner runs";
+    return report.percent ? fmt::format("{}; the last job left {} %", none, *report.percent) : none;
+}
+
 std::string cancel_text(const CancelReport &report) {
     if (report.failure)
         return "nothing was cancelled: " + in_words(*report.failure);
@@ -43,17 +51,16 @@ std::string tools_words(const std::vector<RunningTool> &tools) {
 
 Section progress_section(const ProgressReport &report) {
     const bool runs = !report.running.empty();
+    const Json percent = report.percent ? Json(*report.percent) : Json(nullptr);
     Json json;
     json["kind"] = "progress";
     json["running"] = runs;
-    json["percent"] = runs ? Json(report.percent) : Json(nullptr);
-    json["left_percent"] = runs ? Json(nullptr) : Json(report.percent);
+    json["percent"] = runs ? percent : Json(nullptr);
+    json["left_percent"] = runs ? Json(nullptr) : percent;
     json["tools"] = tools_json(report.running);
     Section section;
     section.key = "progress";
-    section.well =
-        runs ? fmt::format("{} %, running: {}", report.percent, tools_words(report.running))
-             : fmt::format("no tool of the burner runs; the last job left {} %", report.percent);
+    section.well = progress_text(report);
     add_verdict(json, Severity::ok, section.well, "", std::nullopt);
     section.records = json;
     return section;

@@ -20,7 +20,7 @@ std::string tools_words(const std::vector<RunningTool> &tools);
 
 // What a running job told when it was asked.
 struct ProgressReport {
-    int percent = 0;
+    std::optional<int> percent; // none: no job has left a progress
     std::vector<RunningTool> running;
 };
 Section progress_section(const ProgressReport &report);

@@ -114,13 +114,14 @@ void refuse_burn(const BurnRequest &request, const DiscReport &disc, Plan &plan)
 }
 
 std::string place_words(const BurnRequest &request) {
-    const std::string what = fmt::format("{} ({})", printable(request.source.path),
-                                         size_words(request.source.kib.value_or(0)));
+    const std::string what = printable(request.source.path);
+    const std::string size = size_words(request.source.kib.value_or(0));
     const std::string place =
         request.name.empty() ? "the root of the disc" : "directory " + printable(request.name);
     if (request.source.is_file)
-        return fmt::format("{} is burned into {}", what, place);
-    return fmt::format("what {} holds is burned into {}; of a link, what it leads to", what, place);
+        return fmt::format("{}, {}, is burned into {}", what, size, place);
+    return fmt::format("what {} holds, {}, is burned into {}; of a link, what it leads to", what,
+                       size, place);
 }
 
 PlanStep room_step(const BurnRoom &room) {

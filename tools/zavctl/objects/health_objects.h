@@ -14,5 +14,6 @@ void add_port(Command root, Session &session);
 void add_led(Command root, Session &session);
 void add_uart(Command root, Session &session);
 void add_sync(Command root, Session &session);
+void add_disc(Command root, Session &session);
 
 } // namespace zavctl

@@ -28,6 +28,9 @@ struct Stop {
     bool asked = false;
     int descriptor = -1;
     const char *farewell = "";
+    std::chrono::seconds patience{0};
+    const char *reminder = "";
+    std::chrono::steady_clock::time_point asked_at;
 };
 Stop &stop() {
     static Stop *const one = new Stop;
@@ -73,12 +76,24 @@ bool change_goes_on() {
     return true;
 }
 
-// True if a program runs until it is asked to stop, and this is the first time.
+// Whether what the first interrupt began is given its time.
+bool is_patient() {
+    if (std::chrono::steady_clock::now() - stop().asked_at >= stop().patience)
+        return false;
+    [[maybe_unused]] const auto done =
+        write(stop().descriptor, stop().reminder, std::strlen(stop().reminder));
+    return true;
+}
+
+// True if a program runs until it is asked to stop, and this is the first time, or still under way.
 bool stops_by_itself() {
     const std::lock_guard lock(stop().mutex);
-    if (!stop().running || stop().asked)
+    if (!stop().running)
         return false;
+    if (stop().asked)
+        return is_patient();
     stop().asked = true;
+    stop().asked_at = std::chrono::steady_clock::now();
     stop().noted.notify_all();
     return true;
 }
@@ -114,11 +129,14 @@ ChangeGuard::~ChangeGuard() {
     changing = false;
 }
 
-StopGuard::StopGuard(int descriptor, const char *farewell) {
+StopGuard::StopGuard(int descriptor, const char *farewell, std::chrono::seconds patience,
+                     const char *reminder) {
     const std::lock_guard lock(stop().mutex);
     stop().running = true;
     stop().descriptor = descriptor;
     stop().farewell = farewell;
+    stop().patience = patience;
+    stop().reminder = reminder;
 }
 
 StopGuard::~StopGuard() {

@@ -27,10 +27,14 @@ class ChangeGuard {
 
 // While one of these lives, the program runs until it is asked to stop: the first interrupt is
 // noted, so that what has begun is written, and a second one ends the process as ever, with
-// `farewell` written to the descriptor before (what leaves the screen as it was).
+// `farewell` written to the descriptor before (what leaves the screen as it was). A second one that
+// comes within `patience` after the first only has `reminder` written: what the first one began is
+// under way, and cut short it would leave behind what it is to prevent.
 class StopGuard {
   public:
-    explicit StopGuard(int descriptor = -1, const char *farewell = "");
+    explicit StopGuard(int descriptor = -1, const char *farewell = "",
+                       std::chrono::seconds patience = std::chrono::seconds(0),
+                       const char *reminder = "");
     ~StopGuard();
     StopGuard(const StopGuard &) = delete;
     StopGuard &operator=(const StopGuard &) = delete;
