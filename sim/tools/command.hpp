@@ -43,6 +43,12 @@ int run_ethtool(const std::vector<std::string> &words);
 
 int run_mediainfo(const std::vector<std::string> &words);
 int run_cdrecord(const std::vector<std::string> &words);
+int run_mkisofs(const std::vector<std::string> &words);
+int run_growisofs(const std::vector<std::string> &words);
+int run_dvd_format(const std::vector<std::string> &words);
+int run_pktsetup(const std::vector<std::string> &words);
+int run_mkudffs(const std::vector<std::string> &words);
+int run_cdrwtool(const std::vector<std::string> &words);
 int run_du(const std::vector<std::string> &words);
 int run_killall(const std::vector<std::string> &words);
 

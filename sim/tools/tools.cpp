@@ -83,6 +83,12 @@ const std::vector<Tool> &simulated_tools() {
         {"ethtool", "/usr/sbin/ethtool", run_ethtool},
         {"dvd+rw-mediainfo", "/usr/bin/dvd+rw-mediainfo", run_mediainfo},
         {"cdrecord", "/usr/bin/cdrecord", run_cdrecord},
+        {"mkisofs", "/usr/bin/mkisofs", run_mkisofs},
+        {"growisofs", "/usr/bin/growisofs", run_growisofs},
+        {"dvd+rw-format", "/usr/bin/dvd+rw-format", run_dvd_format},
+        {"pktsetup", "/usr/sbin/pktsetup", run_pktsetup},
+        {"mkudffs", "/usr/sbin/mkudffs", run_mkudffs},
+        {"cdrwtool", "/usr/bin/cdrwtool", run_cdrwtool},
         {"killall", "/usr/bin/killall", run_killall},
         {"du", "/usr/bin/du", run_du}};
     return tools;

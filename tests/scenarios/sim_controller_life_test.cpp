@@ -265,13 +265,13 @@ bool has_node(const State &state, const std::string &path) {
     return std::count(paths.begin(), paths.end(), path) == 1;
 }
 
-TEST(ControllerNodes, AreThoseOfItsDisksAndVolumes) {
-    EXPECT_EQ(
-        node_paths(with_units(1)),
-        (std::vector<std::string>{"/dev/hwsata/disk1", "/dev/hwsata/disk2", "/dev/hwsata/disk3",
-                                  "/dev/hwsata/disk4", "/dev/hwraid/disk1", "/dev/hwraid/disk2",
-                                  "/dev/sas/r1disk1", "/dev/sas/r1disk2", "/dev/sas/r1disk3",
-                                  "/dev/sas/r1disk4", "/dev/sasraid/r1disk1"}));
+TEST(ControllerNodes, AreThoseOfItsDisksAndVolumesAndTheDrive) {
+    EXPECT_EQ(node_paths(with_units(1)),
+              (std::vector<std::string>{
+                  "/dev/hwsata/disk1", "/dev/hwsata/disk2", "/dev/hwsata/disk3",
+                  "/dev/hwsata/disk4", "/dev/hwraid/disk1", "/dev/hwraid/disk2", "/dev/sas/r1disk1",
+                  "/dev/sas/r1disk2", "/dev/sas/r1disk3", "/dev/sas/r1disk4",
+                  "/dev/sasraid/r1disk1", "/dev/sr0", "/dev/scd0", "/dev/cdrom"}));
 }
 
 TEST(ControllerNodes, OfADiskGoWithIt) {
