@@ -327,7 +327,7 @@ char *getTableEntrySMBIOS(int type);
 int zavGetStateDisk(zavDevice *dev, zavHddState *info);
 
 /** Readers by minor type. `info` comes with everything but the state filled in; those of the
- *  report fill the rest themselves too. Null pointers: ZAV_RC_ERR_EINVAL from those. */
+ *  report fill the rest themselves too. ZAV_RC_ERR_EINVAL for null pointers. */
 int getDiskStateSATA(zavDevice *dev, zavHddState *info);
 int getDiskStateHWSATA(zavDevice *dev, zavHddState *info);
 int getDiskStateSAS(zavDevice *dev, zavHddState *info);
@@ -374,7 +374,8 @@ int getDiskStateSAS(zavDevice *dev, zavHddState *info);
  */
 int zavGetStateRaid(zavDevice *dev, zavRaidState *info);
 
-/** Readers by minor type; they fill the whole record. getRaidStateHW answers on every model. */
+/** Readers by minor type; they fill the whole record. getRaidStateHW answers on every model.
+ *  ZAV_RC_ERR_EINVAL for null pointers. */
 int getRaidStateSW(zavDevice *dev, zavRaidState *info);
 int getRaidStateISCSI(zavDevice *dev, zavRaidState *info);
 int getRaidStateHW(zavDevice *dev, zavRaidState *info);
@@ -1143,8 +1144,9 @@ int wait_cmd(int fd, struct cdrom_generic_command *cgc, void *buffer, int buflen
  * ZAV_RC_ERR_BADDISC   the disc cannot take this session, or the drive not this disc
  * ZAV_RC_ERR_NODISC    no disc
  * ZAV_RC_ERR_EFBIG     too large: for the disc's total size (session types 0 and 2) or its room
- * (1); also a source that du does not measure ZAV_RC_ERR_CDTOOL    cdrecord or mkisofs failed (the
- * burn itself is logged), or told no number ZAV_RC_ERR_BURNER    growisofs failed (logged)
+ *                      (1); also a source that du does not measure
+ * ZAV_RC_ERR_CDTOOL    cdrecord or mkisofs failed (the burn itself is logged), or told no number
+ * ZAV_RC_ERR_BURNER    growisofs failed (logged)
  * ZAV_RC_ERR           the progress file cannot be written
  * others               as zavQueryDisc returns them
  *

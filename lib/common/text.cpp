@@ -51,6 +51,8 @@ uint32_t to_unsigned(const char *text) {
 double to_double(const char *text) {
     // The C library keeps the "C" locale ready; nothing is allocated.
     const locale_t plain = newlocale(LC_ALL_MASK, "C", nullptr);
+    if (plain == nullptr)
+        return strtod(text, nullptr);
     const double number = strtod_l(text, nullptr, plain);
     freelocale(plain);
     return number;

@@ -62,6 +62,8 @@ int zavGetStateDisk(zavDevice *dev, zavHddState *info) {
 }
 
 int getDiskStateSATA(zavDevice *dev, zavHddState *info) {
+    if (dev == nullptr || info == nullptr)
+        return ZAV_RC_ERR_EINVAL;
     ZAV_TRACE(zav::kTraceStep, "Enter %s().\n", __func__);
     zav::ModelConfig config;
     if (const int rc = config.read(); rc != ZAV_RC_OK) {

@@ -173,6 +173,8 @@ int zavGetStateRaid(zavDevice *dev, zavRaidState *info) {
 }
 
 int getRaidStateSW(zavDevice *dev, zavRaidState *info) {
+    if (dev == nullptr || info == nullptr)
+        return ZAV_RC_ERR_EINVAL;
     ZAV_TRACE(zav::kTraceStep, "Enter %s()\n", __func__);
     zav::ModelConfig config;
     if (const int rc = config.read(); rc != ZAV_RC_OK) {
@@ -205,6 +207,8 @@ int getRaidStateSW(zavDevice *dev, zavRaidState *info) {
 }
 
 int getRaidStateISCSI(zavDevice *dev, zavRaidState *info) {
+    if (dev == nullptr || info == nullptr)
+        return ZAV_RC_ERR_EINVAL;
     ZAV_TRACE(zav::kTraceStep, "Enter %s().\n", __func__);
     if (dev->disk < 1 || dev->part != 0)
         return ZAV_RC_ERR_EINVAL;

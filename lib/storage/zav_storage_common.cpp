@@ -48,6 +48,13 @@ bool change_value(int sem_id, short step) {
 
 } // namespace
 
+// A new semaphore that was not set free would hold up everybody for ever; the next caller makes
+// another.
+static void remove_unset(int created) {
+    if (created >= 0)
+        semctl(created, 0, IPC_RMID);
+}
+
 int semaphore_get(int key, int *sem_id) {
     if (sem_id == nullptr)
         return ZAV_RC_ERR;
@@ -66,10 +73,16 @@ int semaphore_get(int key, int *sem_id) {
         const int error = errno;
         ZAV_LOG(zav::kAlert, kLogNumber, "semget[0x%x] failed!!. errno[%d][%s]",
                 static_cast<unsigned>(key), error, strerror(error));
+        remove_unset(created);
         return ZAV_RC_ERR;
     }
     *sem_id = found;
-    return created < 0 ? ZAV_RC_OK : set_semvalue(found, key);
+    if (created < 0)
+        return ZAV_RC_OK;
+    const int rc = set_semvalue(found, key);
+    if (rc != ZAV_RC_OK)
+        remove_unset(created);
+    return rc;
 }
 
 int set_semvalue(int sem_id, int key) {

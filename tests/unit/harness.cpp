@@ -27,6 +27,9 @@ namespace harness {
 
 namespace {
 
+#define CALL_FAILS(function)                                                                       \
+    (harness::call_fails != nullptr && harness::call_fails(function, __builtin_return_address(0)))
+
 bool record_is_ready = false; // memory is asked for before the record is made
 std::string log_ident;
 int log_options;
@@ -47,6 +50,9 @@ void note_command(const char *command) {
 }
 
 } // namespace
+
+bool (*call_fails)(const char *function, const void *caller) = nullptr;
+void (*allocated)(void *memory, const void *caller) = nullptr;
 
 LogRow row(const std::string &ident, int priority, const std::string &text) {
     return {ident, LOG_CONS | LOG_PID, LOG_DAEMON, priority, text};
@@ -220,6 +226,10 @@ std::ostream &operator<<(std::ostream &out, const zavDevice &dev) {
 extern "C" {
 
 int system(const char *command) {
+    if (CALL_FAILS("system")) {
+        errno = EAGAIN;
+        return -1;
+    }
     harness::note_command(command);
     if (harness::record().before_command)
         harness::record().before_command(command);
@@ -234,6 +244,10 @@ int system(const char *command) {
 }
 
 FILE *popen(const char *command, const char *mode) {
+    if (CALL_FAILS("popen")) {
+        errno = EAGAIN;
+        return nullptr;
+    }
     harness::note_command(command);
     const auto real_popen = harness::real<FILE *(const char *, const char *)>("popen");
     harness::Answer answer;
@@ -261,7 +275,8 @@ int pclose(FILE *pipe) {
         const std::lock_guard turn(harness::notes);
         ++harness::record().pcloses;
     }
-    return harness::real<int(FILE *)>("pclose")(pipe);
+    const int status = harness::real<int(FILE *)>("pclose")(pipe);
+    return CALL_FAILS("pclose") ? -1 : status;
 }
 
 unsigned sleep(unsigned seconds) {
@@ -281,7 +296,7 @@ int usleep(useconds_t microseconds) {
 }
 
 int fprintf(FILE *file, const char *format, ...) {
-    if (harness::record().fprintf_fails) {
+    if (CALL_FAILS("fprintf") || harness::record().fprintf_fails) {
         errno = EIO;
         return -1;
     }
@@ -294,7 +309,7 @@ int fprintf(FILE *file, const char *format, ...) {
 
 int munmap(void *address, size_t size) noexcept {
     const auto rc = static_cast<int>(syscall(SYS_munmap, address, size));
-    return harness::record().munmap_fails ? -1 : rc;
+    return CALL_FAILS("munmap") || harness::record().munmap_fails ? -1 : rc;
 }
 
 int semget(key_t key, int semaphores, int flags) {
@@ -302,7 +317,7 @@ int semget(key_t key, int semaphores, int flags) {
         const std::lock_guard turn(harness::notes);
         harness::record().semget_flags.push_back(flags);
     }
-    if (harness::record().semget_fails) {
+    if (CALL_FAILS("semget") || harness::record().semget_fails) {
         errno = ENOSPC;
         return -1;
     }
@@ -310,6 +325,12 @@ int semget(key_t key, int semaphores, int flags) {
 }
 
 int semop(int id, sembuf *operations, size_t count) {
+    if (CALL_FAILS("semop")) { // such as a semaphore that somebody has removed
+        if (operations[0].sem_op > 0)
+            semctl(id, 0, IPC_RMID);
+        errno = EIDRM;
+        return -1;
+    }
     if (harness::record().semop_fails && harness::record().semop_fails(operations[0].sem_op)) {
         errno = EIDRM;
         return -1;
@@ -320,6 +341,10 @@ int semop(int id, sembuf *operations, size_t count) {
 // The library asks the appliance's drivers, by small numbers, and the optical drive, by those of
 // CD-ROMs. Others are a test's own.
 int ioctl(int descriptor, unsigned long request, ...) noexcept {
+    if (CALL_FAILS("ioctl")) {
+        errno = EIO;
+        return -1;
+    }
     va_list arguments;
     va_start(arguments, request);
     void *argument = va_arg(arguments, void *);
@@ -340,6 +365,8 @@ int ioctl(int descriptor, unsigned long request, ...) noexcept {
 
 int pthread_create(pthread_t *thread, const pthread_attr_t *attributes, void *(*body)(void *),
                    void *argument) noexcept {
+    if (CALL_FAILS("pthread_create"))
+        return EAGAIN;
     if (harness::record().thread_code) {
         EXPECT_EQ(attributes, nullptr);
         EXPECT_EQ(argument, nullptr);
@@ -351,6 +378,10 @@ int pthread_create(pthread_t *thread, const pthread_attr_t *attributes, void *(*
 }
 
 int open(const char *path, int flags, ...) {
+    if (CALL_FAILS("open")) {
+        errno = EMFILE;
+        return -1;
+    }
     va_list arguments;
     va_start(arguments, flags);
     const int mode = (flags & O_CREAT) != 0 ? va_arg(arguments, int) : 0;
@@ -364,7 +395,7 @@ time_t time(time_t *result) noexcept {
     auto &times = harness::record().times;
     timespec now = {};
     clock_gettime(CLOCK_REALTIME, &now);
-    time_t answer = now.tv_sec;
+    time_t answer = CALL_FAILS("time") ? -1 : now.tv_sec;
     if (!times.empty()) {
         answer = times.front();
         if (times.size() > 1)
@@ -379,7 +410,7 @@ time_t time(time_t *result) noexcept {
 
 int statfs(const char *path, struct statfs *answer) noexcept {
     harness::record().measured = path;
-    if (!harness::record().file_system) {
+    if (CALL_FAILS("statfs") || !harness::record().file_system) {
         errno = EACCES;
         return -1;
     }
@@ -391,7 +422,7 @@ int statfs(const char *path, struct statfs *answer) noexcept {
 // is ready.
 void *calloc(size_t count, size_t size) noexcept {
     size_t bytes = 0;
-    if (harness::record_is_ready && harness::record().calloc_fails) {
+    if (CALL_FAILS("calloc") || (harness::record_is_ready && harness::record().calloc_fails)) {
         errno = ENOMEM;
         return nullptr;
     }
@@ -403,6 +434,8 @@ void *calloc(size_t count, size_t size) noexcept {
     void *memory = allocate(bytes);
     if (memory != nullptr)
         memset(memory, 0, bytes);
+    if (harness::allocated != nullptr)
+        harness::allocated(memory, __builtin_return_address(0));
     return memory;
 }
 

@@ -90,6 +90,12 @@ struct Record {
 
 Record &record();
 
+// Set by a program that lets single calls of the library fail: every stand-in for a function of the
+// C library asks it, with the function's name and where it is called from, before it does anything.
+extern bool (*call_fails)(const char *function, const void *caller);
+// Told of memory that a stand-in has given out.
+extern void (*allocated)(void *memory, const void *caller);
+
 // A fresh appliance for each test: nothing of an earlier test is left in the root.
 class Appliance : public ::testing::Test {
   protected:

@@ -166,6 +166,20 @@ TEST_F(Disk, ArgumentsMustNotBeNull) {
     EXPECT_EQ(record().log, (std::vector{refused, refused}));
 }
 
+TEST_F(Disk, ReaderTakesNoNullPointers) {
+    zavDevice dev = kDisk3;
+    EXPECT_EQ(getDiskStateSATA(nullptr, &info), ZAV_RC_ERR_EINVAL);
+    EXPECT_EQ(getDiskStateSATA(&dev, nullptr), ZAV_RC_ERR_EINVAL);
+}
+
+TEST_F(Disk, ReaderAnswersByItself) {
+    insert(3);
+    smartctl_exits(0);
+    zavDevice dev = kDisk3;
+    EXPECT_EQ(checked([&] { return getDiskStateSATA(&dev, &info); }), ZAV_RC_OK);
+    EXPECT_EQ(info.state, ZAV_HDD_FOUND);
+}
+
 TEST_F(Disk, OtherDeviceTypesAreRefused) {
     EXPECT_EQ(ask({ZAV_DEV_RAID, ZAV_MINDEV_HDD_SATA, 3, 1}), ZAV_RC_ERR_EINVAL);
     expect_untouched();

@@ -437,6 +437,21 @@ TEST_F(IscsiTarget, ThatExistsHasNoStateBits) {
     EXPECT_TRUE(record().commands.empty());
 }
 
+TEST_F(IscsiTarget, ReaderAnswersByItself) {
+    put("/dev/iscsiraid/disk7", "");
+    zavDevice dev = kTarget;
+    EXPECT_EQ(checked([&] { return getRaidStateISCSI(&dev, &info); }), ZAV_RC_OK);
+    expect_target(0);
+}
+
+TEST_F(IscsiTarget, ReadersTakeNoNullPointers) {
+    zavDevice dev = kTarget;
+    for (const auto reader : {getRaidStateISCSI, getRaidStateSW}) {
+        EXPECT_EQ(reader(nullptr, &info), ZAV_RC_ERR_EINVAL);
+        EXPECT_EQ(reader(&dev, nullptr), ZAV_RC_ERR_EINVAL);
+    }
+}
+
 TEST_F(IscsiTarget, ThatIsMissingDoesNotExistAfterTwoGraceWaits) {
     EXPECT_EQ(ask(kTarget), ZAV_RC_OK);
     expect_target(ZAV_RAID_NOT_EXIST);

@@ -1,0 +1,56 @@
+// What the program that lets calls fail knows of a run: which calls the library made, which of them
+// is to fail, and what was found afterwards. Shared between the process that runs and the one that
+// plans.
+#pragma once
+
+#include <cstddef>
+#include <cstdint>
+
+namespace faults {
+
+enum class Fate : int {
+    fails,
+    is_short
+}; // short: reads and writes do half of what they were asked
+
+// One call of the C library by the library.
+struct Point {
+    const char *call;      // "popen"
+    std::uintptr_t caller; // where in the library
+    int function;          // the exported function that was called, by its number
+    int occurrence;        // of that place within that call
+    bool may_be_short;
+};
+
+constexpr std::size_t kMostPoints = 20000;
+constexpr std::size_t kMostFunctions = 160;
+
+struct Board {
+    int target;        // the point that is to fail, -1: none
+    Fate fate;         // how
+    bool fired;        // it has
+    bool finished;     // the call in which it has is over
+    bool overlapping;  // several threads were in the library at once: points have no order
+    std::size_t count; // of points
+    bool called[kMostFunctions];
+    char complaint[512]; // "" if nothing is wrong
+    Point points[kMostPoints];
+};
+
+extern Board *board;
+
+// Is the call to fail? Counts it, if it is one of the library's.
+bool fails(const char *call, const void *caller);
+// The same for a call that may also do half of its work.
+bool fails(const char *call, const void *caller, bool &halved);
+
+// Heap blocks that the library has asked for.
+void block_given(void *memory, const void *caller);
+void block_returned(void *memory);
+
+// Is the code at this address the library's?
+bool in_library(const void *caller);
+
+void complain(const char *format, ...) __attribute__((format(printf, 1, 2)));
+
+} // namespace faults
