@@ -68,12 +68,16 @@ int query() {
     return 0;
 }
 
+int number(const char *word) {
+    return static_cast<int>(strtol(word, nullptr, 10));
+}
+
 int burn(char **words) {
-    return told(zavCDBurn(words[0], atoi(words[1])));
+    return told(zavCDBurn(words[0], number(words[1])));
 }
 
 int burn_below(char **words) {
-    return told(zavCDBurnEx(words[0], words[1], atoi(words[2])));
+    return told(zavCDBurnEx(words[0], words[1], number(words[2])));
 }
 
 // Says how READ DISC INFORMATION ends and which status it tells.

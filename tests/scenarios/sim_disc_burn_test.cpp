@@ -216,6 +216,14 @@ TEST(FailingTool, MayBeTheOneThatMakesTheImage) {
               "DVD tool failed\nCD tool failed\n");
 }
 
+TEST(FailingTool, LeavesAnIncompleteSessionAlsoWhenItMakesTheImage) {
+    EXPECT_EQ(
+        library("gets blank DVD+R; zavsim act tool mkisofs fails at 40%; $probe burn /tmp/s 1\n"
+                "zavsim act tool mkisofs works again; ls /media/cdrom; $probe burn /tmp/t 1")
+            .out,
+        "DVD tool failed\nDVD tool failed\n");
+}
+
 TEST(FailingTool, GoesUnseenBeforeACdThatStaysOpen) {
     EXPECT_EQ(library("zavsim act tool mkisofs fails at 40%; gets blank CD-R\n"
                       "$probe burn /tmp/s 1; on_disc /tmp/s")
