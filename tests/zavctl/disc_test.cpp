@@ -95,6 +95,12 @@ TEST(Disc, WhatIsNotToldIsUnknown) {
                                   "known: the media tools do not tell the state");
 }
 
+TEST(Disc, TheStateOfWhatIsNeverBurnedDoesNotMatter) {
+    for (const int type : {ZAV_DVD_ROM, ZAV_DVD_RAM})
+        EXPECT_EQ(severity(disc(type, ZAV_DISC_STATE_UNKNOWN, 0, 0)), Severity::ok);
+    EXPECT_EQ(summary_of(disc(ZAV_DVD_ROM, ZAV_DISC_STATE_UNKNOWN, 0, 0)), "OK: DVD-ROM");
+}
+
 TEST(Disc, ADiscWithoutANameButWithAStateIsWell) {
     const DiscReport report = disc(ZAV_DISC_UNKNOWN, ZAV_DISC_COMPLETE, 0, 0);
     EXPECT_EQ(summary_of(report), "OK: a disc of no known type, complete");

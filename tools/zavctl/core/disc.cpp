@@ -35,6 +35,10 @@ bool state_known(const DiscReport &report) {
     return report.media.discState != ZAV_DISC_STATE_UNKNOWN;
 }
 
+bool state_matters(const DiscReport &report) {
+    return report.media.discType != ZAV_DVD_ROM && report.media.discType != ZAV_DVD_RAM;
+}
+
 bool drive_refuses(const DiscReport &report) {
     return report.drive == DriveKind::combo && zav::combo_drive_refuses(report.media.discType);
 }
@@ -158,8 +162,10 @@ std::string size_words(int kib) {
 
 std::string disc_words(const DiscReport &report) {
     const bool named = report.media.discType != ZAV_DISC_UNKNOWN;
-    return fmt::format("{}, {}", named ? medium_word(report) : "a disc of no known type",
-                       state_known(report) ? state_word(report) : "in a state that is not known");
+    const std::string medium = named ? medium_word(report) : "a disc of no known type";
+    if (state_known(report))
+        return medium + ", " + state_word(report);
+    return state_matters(report) ? medium + ", in a state that is not known" : medium;
 }
 
 } // namespace zavctl

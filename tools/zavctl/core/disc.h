@@ -50,6 +50,7 @@ const std::vector<SessionType> &all_sessions();
 bool is_write_once(int disc_type);
 bool is_cd(int disc_type);
 bool state_known(const DiscReport &report);
+bool state_matters(const DiscReport &report); // it may take a burn in one of its states
 bool drive_refuses(const DiscReport &report); // a combo drive, as far as the library asks
 bool holds_disc(const DiscReport &report);
 

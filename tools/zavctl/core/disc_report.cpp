@@ -106,7 +106,8 @@ Severity severity(const DiscReport &report) {
         return Severity::ok;
     if (report.failure)
         return Severity::unknown;
-    return holds_disc(report) && !state_known(report) ? Severity::unknown : Severity::ok;
+    const bool told = state_known(report) || !state_matters(report);
+    return holds_disc(report) && !told ? Severity::unknown : Severity::ok;
 }
 
 std::string disc_note(const DiscReport &report) {
@@ -116,7 +117,7 @@ std::string disc_note(const DiscReport &report) {
         return in_words(*report.failure);
     if (!holds_disc(report))
         return "";
-    if (!state_known(report))
+    if (severity(report) == Severity::unknown)
         return "the media tools do not tell the state";
     if (report.media.discType == ZAV_DISC_UNKNOWN)
         return "the media tools do not name it, as a pressed CD";

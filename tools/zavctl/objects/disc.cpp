@@ -16,8 +16,10 @@ constexpr VerbHelp info_help = {
     "  appendable  more can be added\n"
     "  complete    closed; a DVD+RW and a DVD-RW for restricted overwrite take more all the same\n"
     "  unknown     the media tools do not tell                             could not tell\n"
-    "its room (of a DVD-ROM and a DVD-RAM not known), the sessions that 'disc burn' would burn on\n"
-    "it, and whether it can be erased and formatted. No disc, and no drive, are well.\n"
+    "              (of a DVD-ROM and a DVD-RAM, which no burn is for, that is well)\n"
+    "its room (of these two not known), the sessions that 'disc burn' would burn on it, and "
+    "whether\n"
+    "it can be erased and formatted. No disc, and no drive, are well.\n"
     "Could not tell: the drive or its tools give no answer. It takes some ten seconds after a\n"
     "disc was put in.",
     "  zavctl disc info\n"

@@ -1,6 +1,8 @@
 #include "objects.h"
 
+#include "../core/disc_checks.h"
 #include "../core/driver_checks.h"
+#include "../system/disc.h"
 #include "../system/drivers.h"
 #include "../system/platform.h"
 
@@ -13,7 +15,8 @@ constexpr VerbHelp help = {
     "Shown: one line per precondition with what was found and, where something is missing, what\n"
     "that means for the answers: the shell, the model and its configuration, the tools and what\n"
     "they answer, /proc/mdstat, device names, hot plug, the BIOS device, locks, the log, locale,\n"
-    "and what volumes, the exchange of a disk, sensors, LEDs, events and network need besides.\n"
+    "and what volumes, the exchange of a disk, sensors, LEDs, events, network and, where there is\n"
+    "a drive, discs need besides.\n"
     "Warning: some functions or some arrays are affected.\n"
     "Critical: states of disks and arrays cannot be trusted or told.\n"
     "Nothing is changed (a file is made in /etc/Kiru/zav and removed); a tool that does not answer "
@@ -30,6 +33,8 @@ void add_doctor(Command root, Session &session) {
         session.action = [] {
             std::vector<Check> checks = platform_checks(read_platform(read_model()));
             for (const Check &check : driver_checks(read_drivers()))
+                checks.push_back(check);
+            for (const Check &check : burner_checks(read_burner_platform()))
                 checks.push_back(check);
             return Answer{"doctor", "", {doctor_section(checks)}};
         };

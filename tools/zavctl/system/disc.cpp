@@ -124,8 +124,11 @@ DiscReport query_disc(std::chrono::seconds limit) {
     if (report.drive == DriveKind::none)
         return report;
     Job job(query);
-    job.wait(limit);
-    read_query(job, drive, report);
+    if (job.wait(limit))
+        read_query(job, drive, report);
+    else
+        report.failure =
+            Failure{-1, "", "no answer within " + std::to_string(limit.count()) + " s"};
     return report;
 }
 
