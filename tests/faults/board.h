@@ -18,7 +18,7 @@ struct Point {
     const char *call;      // "popen"
     std::uintptr_t caller; // where in the library
     int function;          // the exported function that was called, by its number
-    int occurrence;        // of that place within that call
+    int occurrence;        // of that place within that call, 2 from the third on
     bool may_be_short;
 };
 
