@@ -126,8 +126,9 @@ TEST(BurnPlan, ADiscWithoutRoomIsRefused) {
 TEST(BurnPlan, ASourceThatIsNotMeasuredIsRefused) {
     BurnRequest request = directory(0);
     request.source.kib.reset();
-    EXPECT_NE(burn_refusal(request, disc(ZAV_CD_R, ZAV_DISC_BLANK)).find("du does not measure"),
-              std::string::npos);
+    request.source.trouble = "du: not started";
+    EXPECT_EQ(burn_refusal(request, disc(ZAV_CD_R, ZAV_DISC_BLANK)),
+              "du does not measure the source (du: not started): nobody knows whether it fits");
 }
 
 TEST(BurnPlan, WhatCannotBeReadOfTheSourceIsAWarning) {

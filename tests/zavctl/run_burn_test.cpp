@@ -209,6 +209,19 @@ TEST(RunBurn, AnInterruptStopsTheBurnAndTellsTheDisc) {
     }
 }
 
+// The terminal sends it to every process of zavctl's group: it is to reach zavctl alone.
+TEST(RunBurn, CtrlCAtTheTerminalStopsTheBurnInOrder) {
+    const Outcome run =
+        on_zav(with_disc("blank DVD+R") + slowly +
+               "mkfifo keys; TERM=xterm env --default-signal=INT script -qec 'zavctl disc burn src "
+               "--yes' /dev/null <keys >out & pid=$!; exec 3>keys; until zavctl disc progress | "
+               "grep -q growisofs || ! kill -0 $pid; do sleep 5; done; printf '\\003' >&3; wait "
+               "$pid; status=$?; cat out; exit $status");
+    EXPECT_EQ(run.status, 2) << run.out << run.err;
+    EXPECT_TRUE(holds(run.out, "interrupted: the job is being stopped")) << run.out;
+    EXPECT_TRUE(holds(run.out, "the burn was stopped; the disc is DVD+R, ")) << run.out;
+}
+
 TEST(RunBurn, AToolThatFailsIsTold) {
     for (const char *tool : {"growisofs", "mkisofs"}) {
         const bool dvd = std::string(tool) == "growisofs";

@@ -96,9 +96,10 @@ std::string why_not(const DiscReport &disc, SessionType session) {
                        session_word(session), disc_words(disc), sessions_words(disc));
 }
 
-std::string too_large(const BurnRoom &room) {
+std::string too_large(const SourceFact &source, const BurnRoom &room) {
     if (!room.source)
-        return "du does not measure the source, so that nobody knows whether it fits";
+        return fmt::format("du does not measure the source ({}): nobody knows whether it fits",
+                           source.trouble.empty() ? "no number" : printable(source.trouble));
     const int counts = (room.free_counts ? room.free : room.total).value_or(0);
     return fmt::format("the source takes {}, and the disc has {} {}, which is what counts here",
                        size_words(*room.source), counts > 0 ? size_words(counts) : "nothing",
@@ -110,7 +111,7 @@ void refuse_burn(const BurnRequest &request, const DiscReport &disc, Plan &plan)
     if (drive_refuses(disc) || !takes(disc, session))
         refuse(plan, why_not(disc, session));
     else if (const BurnRoom room = burn_room(request, disc); !room.fits)
-        refuse(plan, too_large(room));
+        refuse(plan, too_large(request.source, room));
 }
 
 std::string place_words(const BurnRequest &request) {

@@ -84,10 +84,11 @@ void read_query(const Job &job, const DriveFacts &drive, DiscReport &report) {
         report.failure->meaning = query_failure_meaning(result.code, drive);
 }
 
-// du's own line begins with the number, what it complains of with its name.
+// What du complains of stands before its one line, which begins with the number; a path may have
+// several lines.
 void read_measure(const std::string &output, SourceFact &source) {
     std::istringstream lines(output);
-    for (std::string line; std::getline(lines, line);) {
+    for (std::string line; !source.kib && std::getline(lines, line);) {
         if (!line.empty() && std::isdigit(static_cast<unsigned char>(line.front())) != 0)
             source.kib =
                 static_cast<int>(std::min(std::strtol(line.c_str(), nullptr, 10), 0x7FFFFFFFL));
