@@ -3,6 +3,7 @@
 #include "common/text.h"
 #include "zav_api.h"
 
+#include <cstdint>
 #include <cstring>
 #include <initializer_list>
 
@@ -51,13 +52,19 @@ RaidDecision decide_mirror(int members, int active, const char *status) {
     return {true, ZAV_RAID_DEGRADED, 0.0F, "RAID1"};
 }
 
+// Both numbers are told by a tool, and may be any.
+int64_t lost_members(int members, int active) {
+    return int64_t{members} - active;
+}
+
 RaidDecision decide_parity(int members, int active, const char *status) {
     if (contains(status, "[UUU]") || contains(status, "[UUUU]") || active == members)
         return normal();
+    const int64_t lost = lost_members(members, active);
     int state = ZAV_RAID_NORMAL; // more active members than the layout has
-    if (active == members - 1)
+    if (lost == 1)
         state = ZAV_RAID_DEGRADED;
-    else if (active <= members - 2)
+    else if (lost >= 2)
         state = ZAV_RAID_FAILED;
     return {true, state, 0.0F, "RAID5"};
 }
@@ -73,10 +80,11 @@ bool one_of_each_pair(const char *status) {
 RaidDecision decide_striped_mirror(int members, int active, const char *status) {
     if (contains(status, "[UUUU]") || active == members)
         return normal();
+    const int64_t lost = lost_members(members, active);
     int state = ZAV_RAID_NORMAL; // more active members than the layout has
-    if (active == members - 1 || (active == members - 2 && one_of_each_pair(status)))
+    if (lost == 1 || (lost == 2 && one_of_each_pair(status)))
         state = ZAV_RAID_DEGRADED;
-    else if (active <= members - 2)
+    else if (lost >= 2)
         state = ZAV_RAID_FAILED;
     return {true, state, 0.0F, "RAID10"};
 }
