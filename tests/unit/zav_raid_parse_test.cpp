@@ -185,7 +185,7 @@ void expect_line(const std::string &line, Kind kind, int percent = kUntouched) {
     EXPECT_EQ(read, percent) << line;
 }
 
-TEST(RaidState, OfNumbersThatNoArrayHasIsDecidedAllTheSame) {
+TEST(ArrayState, OfNumbersThatNoArrayHasIsDecidedAllTheSame) {
     for (const int level : {ZAV_RAIDLVL_5, ZAV_RAIDLVL_10}) {
         EXPECT_EQ(zav::decide_raid_state(level, INT_MIN, 0, "").state, ZAV_RAID_NORMAL) << level;
         EXPECT_EQ(zav::decide_raid_state(level, INT_MAX, INT_MIN, "").state, ZAV_RAID_FAILED)
