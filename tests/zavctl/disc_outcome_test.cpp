@@ -64,6 +64,29 @@ TEST(DiscOutcome, ADiscThatContradictsASuccessIsCritical) {
     EXPECT_EQ(job_outcome(erasing).word, "incomplete");
 }
 
+// 36600 KiB of a blank CD, and 13800 KiB of another, go to borders and reserve.
+TEST(DiscOutcome, WhatAnOpenSessionPutOnACdIsSeenByItsRoom) {
+    const DiscReport after = disc(ZAV_CD_R, ZAV_DISC_APPENDABLE, 700000, 500000);
+    const DiscReport blank = disc(ZAV_CD_R, ZAV_DISC_BLANK, 700000, 700000);
+    const DiscReport appendable = disc(ZAV_CD_R, ZAV_DISC_APPENDABLE, 700000, 600000);
+    EXPECT_EQ(written_to_cd(burn(blank, after)), 163400);
+    EXPECT_EQ(written_to_cd(burn(appendable, after)), 86200);
+    EXPECT_FALSE(written_to_cd(burn(disc(ZAV_DVD_PLUS_R, ZAV_DISC_BLANK), after)));
+}
+
+TEST(DiscOutcome, AnImageThatEndedEarlyIsNoSuccess) {
+    JobFacts facts = burn(disc(ZAV_CD_R, ZAV_DISC_BLANK, 700000, 700000),
+                          disc(ZAV_CD_R, ZAV_DISC_APPENDABLE, 700000, 500000));
+    facts.image_kib = 163700;
+    EXPECT_EQ(job_outcome(facts).word, "done");
+    facts.image_kib = 400000;
+    EXPECT_EQ(job_outcome(facts).word, "incomplete");
+    EXPECT_EQ(
+        summary_of(facts),
+        "CRITICAL: the library reports success, but 163400 KiB (159.6 MiB) are on the disc of "
+        "an image of 400000 KiB (390.6 MiB): mkisofs ended early, files are missing");
+}
+
 TEST(DiscOutcome, ADriveThatIsSilentAfterwardsIsUnknown) {
     const JobFacts facts = burn(disc(ZAV_CD_R, ZAV_DISC_BLANK), silent_drive());
     EXPECT_EQ(job_outcome(facts).word, "done");

@@ -234,6 +234,39 @@ TEST(RunBurn, AToolThatFailsIsTold) {
     }
 }
 
+// Of the pipe to cdrecord the shell tells the last status alone, which the library takes for
+// success.
+TEST(RunBurn, AnImageThatEndsEarlyIsNoSuccess) {
+    const Outcome run = on_zav(with_disc("blank CD-R") +
+                               "zavsim act tool mkisofs fails at 40%; zavctl disc burn src --yes "
+                               "--json");
+    EXPECT_EQ(run.status, 2) << run.out;
+    EXPECT_EQ(answer_of(run)["outcome"]["outcome"], "incomplete");
+    EXPECT_TRUE(holds(run.out, "mkisofs ended early, files are missing")) << run.out;
+}
+
+TEST(RunBurn, AToolThatFailsHalfWayIsTold) {
+    const Outcome run = on_zav(with_disc("blank DVD-R") +
+                               "zavsim act tool growisofs fails at 40%; zavctl disc burn src --yes "
+                               "--json");
+    EXPECT_EQ(run.status, 2) << run.out;
+    EXPECT_EQ(answer_of(run)["outcome"]["error"]["code"], 0x2100);
+    EXPECT_EQ(answer_of(run)["disc"]["state"], "appendable");
+}
+
+TEST(RunBurn, TheNameIsADirectoryOfTheDisc) {
+    const std::string left_over = "mkdir /tmp/burnDir; ln -s /etc /tmp/burnDir/old; ";
+    const auto root = [&left_over](const std::string &words) {
+        return on_zav(with_disc("blank DVD+R") + left_over + "zavctl disc burn " + words +
+                      " --yes >/dev/null && ls /media/cdrom; ls /tmp/burnDir /tmp/linkDir")
+            .out;
+    };
+    EXPECT_EQ(root("src"), "data\nsub\n");
+    EXPECT_EQ(root("src --to two"), "two\n");
+    EXPECT_EQ(root("src/data --to logs"), "logs\n");
+    EXPECT_EQ(root("./src/../src/data"), "data\n");
+}
+
 // The drive is gone when the library wants to ask it about the CD that has come into it.
 TEST(RunBurn, ALibraryThatEndsItsProcessIsTold) {
     const Outcome run =

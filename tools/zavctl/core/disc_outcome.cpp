@@ -4,6 +4,8 @@
 
 #include <fmt/format.h>
 
+#include <algorithm>
+
 namespace zavctl {
 
 namespace {
@@ -43,6 +45,17 @@ std::string now_words(const DiscReport &disc) {
                             : "");
 }
 
+// A CD's recorder takes an image that ends early for a whole one, and so does the library.
+std::string what_is_missing(const JobFacts &facts) {
+    constexpr int pre_gap = 300; // kilobytes that drives count differently
+    const std::optional<int> written = written_to_cd(facts);
+    if (!written || !facts.image_kib || *written + pre_gap >= *facts.image_kib)
+        return "";
+    return fmt::format("{} are on the disc of an image of {}: mkisofs ended early, files are "
+                       "missing",
+                       size_words(std::max(0, *written)), size_words(*facts.image_kib));
+}
+
 // What the disc shows that a job which was done does not leave; "" if nothing.
 std::string contradiction(const JobFacts &facts) {
     const int state = facts.after.media.discState;
@@ -56,7 +69,7 @@ std::string contradiction(const JobFacts &facts) {
     if (facts.job == DiscJob::blank && facts.after.media.discType == ZAV_CD_RW &&
         state != ZAV_DISC_BLANK)
         return "the disc is not blank";
-    return "";
+    return facts.job == DiscJob::burn ? what_is_missing(facts) : "";
 }
 
 void add(Outcome &outcome, Severity severity, const std::string &text) {
@@ -122,6 +135,18 @@ Outcome of_interrupt(const JobFacts &facts) {
 }
 
 } // namespace
+
+std::optional<int> written_to_cd(const JobFacts &facts) {
+    constexpr int reserve = 13800;      // kilobytes that the library keeps of an appendable CD
+    constexpr int first_border = 22800; // kilobytes of lead-out, lead-in and gap
+    constexpr int border = 13800;
+    const bool was_blank = facts.before.media.discState == ZAV_DISC_BLANK;
+    if (!is_cd(facts.before.media.discType) || facts.session != SessionType::open ||
+        !holds_disc(facts.after) || facts.after.media.discState != ZAV_DISC_APPENDABLE)
+        return std::nullopt;
+    return facts.before.media.discAvailableSize - facts.after.media.discAvailableSize -
+           (was_blank ? reserve + first_border : border);
+}
 
 std::string child_end_words(const ChildEnd &end) {
     const std::string printed = printable(trimmed(end.printed));

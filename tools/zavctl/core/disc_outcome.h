@@ -4,6 +4,7 @@
 #include "disc_report.h"
 #include "plan.h"
 
+#include <optional>
 #include <string>
 
 namespace zavctl {
@@ -29,7 +30,12 @@ struct JobFacts {
     ChildEnd end;
     std::optional<Failure> failure; // what the library returned, if it answered
     bool cancelled = false;         // by an interrupt
+    std::optional<int> image_kib;   // how large the burned file system was to be, if that is known
 };
+
+// Kilobytes that an open session has put on a CD, by the room that is left: without the lead-in and
+// lead-out, which cost room as well. None for other discs and sessions.
+std::optional<int> written_to_cd(const JobFacts &facts);
 
 // What a code means that a job returned.
 std::string job_failure_meaning(int code);

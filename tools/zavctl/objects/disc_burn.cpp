@@ -132,19 +132,27 @@ Question ask_size(const Session &session, const Shared<SourceFact> &sources, Sou
     });
 }
 
-Answer burn(Session &session, const BurnWords &words, const ChangeOptions &options) {
-    BurnRequest request = request_of(words);
-    const auto sources = no_reports<SourceFact>();
-    const DiscReport disc = ask_drive(session, {ask_size(session, sources, request.source)});
-    request.source = sources->front();
+DiscWork work_of(const Session &session, const BurnRequest &request, const DiscReport &disc) {
     const SessionType type = chosen_session(request, disc);
     DiscWork work;
     work.session = type;
     work.doing = "writing";
     work.call = [request, type] { return library::burn(request, type); };
-    Answer answer = carry_out_job(session, burn_plan(request, read_burner(disc)), options,
-                                  "Burn it?", work, disc);
-    answer.sections.push_back(room_section(burn_room(request, disc), type));
+    if (is_cd(disc.media.discType) && type == SessionType::open) // elsewhere the tools see to it
+        work.image_kib = image_size(request.source, std::chrono::seconds(session.options.timeout));
+    return work;
+}
+
+Answer burn(Session &session, const BurnWords &words, const ChangeOptions &options) {
+    BurnRequest request = request_of(words);
+    const auto sources = no_reports<SourceFact>();
+    const DiscReport disc = ask_drive(session, {ask_size(session, sources, request.source)});
+    request.source = sources->front();
+    const Plan plan = burn_plan(request, read_burner(disc));
+    const DiscWork work = plan.refused() ? DiscWork() : work_of(session, request, disc);
+    Answer answer = carry_out_job(session, plan, options, "Burn it?", work, disc);
+    answer.sections.push_back(
+        room_section(burn_room(request, disc), chosen_session(request, disc)));
     return answer;
 }
 

@@ -97,6 +97,7 @@ JobFacts run_disc_job(const Session &session, const DiscWork &work, const DiscRe
     facts.job = work.job;
     facts.session = work.session;
     facts.before = before;
+    facts.image_kib = work.image_kib;
     JobScreen screen(session.streams, work);
     Job job(work.call);
     facts.cancelled = watch(job, work, screen);

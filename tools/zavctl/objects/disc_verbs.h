@@ -6,6 +6,7 @@
 #include "change.h"
 
 #include <functional>
+#include <optional>
 #include <string>
 #include <vector>
 
@@ -21,6 +22,7 @@ struct DiscWork {
     std::string doing; // "writing", while the percentage grows
     bool has_progress = true;
     std::function<std::string()> call;
+    std::optional<int> image_kib; // what it is to burn, if that is known
 };
 
 // Runs it, shows its progress, stops it in order on an interrupt, and asks the drive what the disc

@@ -162,6 +162,19 @@ void measure(SourceFact &source, std::chrono::seconds limit) {
         source.trouble = "du: " + how_it_ended(du);
 }
 
+std::optional<int> image_size(const SourceFact &source, std::chrono::seconds limit) {
+    constexpr long sector = 2; // kilobytes
+    const RunResult mkisofs =
+        run({"mkisofs", "-R", "-J", "-f", "-q", "-print-size", source.path}, limit);
+    const std::string output = trimmed(mkisofs.output);
+    const std::string last = output.substr(output.rfind('\n') + 1);
+    const long sectors = std::strtol(last.c_str(), nullptr, 10);
+    if (mkisofs.end != RunResult::End::exited || mkisofs.status != 0 || sectors <= 0 ||
+        sectors > 0x7FFFFFFFL / sector)
+        return std::nullopt;
+    return static_cast<int>(sectors * sector);
+}
+
 std::vector<RunningTool> running_tools() {
     std::vector<RunningTool> running;
     for (const char *name : watched_tools)

@@ -25,6 +25,9 @@ BurnerPlatform read_burner_platform();
 // How large a source is, as the library measures it.
 void measure(SourceFact &source, std::chrono::seconds limit);
 
+// How large the file system is that would be burned; none if mkisofs does not tell.
+std::optional<int> image_size(const SourceFact &source, std::chrono::seconds limit);
+
 // The tools that zavCDBurnCancel ends, and those that no query starts, as far as they run.
 std::vector<RunningTool> running_tools();
 
