@@ -1,7 +1,7 @@
 #!/usr/bin/env bash
 # A simulated appliance loses a disk and gets another, and a volume group comes and goes; on another,
 # a unit of its cascade runs hot and loses a disk; a third one overheats, loses a fan, its power and a
-# link while it is watched. All with zavctl. Ends with status 0 if every step came out as announced.
+# link while it is watched; a fourth one burns discs. All with zavctl. Ends with status 0 if every step came out as announced.
 # usage: sim/demo.sh BUILD-DIRECTORY
 set -euo pipefail
 
@@ -17,6 +17,7 @@ if [ $# -eq 1 ]; then
     play disks --model 2860-4
     play units --model 2980 --units 5
     play health --model 2860-4
+    play discs --model 2740-2
     exit
 fi
 PATH=$1:$PATH
@@ -156,6 +157,54 @@ health_scene() {
     wait "$watch" "$follow" || fail "the watch does not end well"
     show 0 zavctl check
     show 0 sh -c "zavctl metrics | grep -E '^zav_(temperature|fan|ups)'"
+}
+
+# Percent that the running burn has done.
+burned() {
+    local percent
+    percent=$(zavctl disc progress --json | sed -n 's/.*"percent": \([0-9][0-9]*\).*/\1/p')
+    printf '%s' "${percent:-0}"
+}
+
+discs_scene() {
+    tell "A fourth appliance archives a directory to DVD+R; the disc stays open for more."
+    mkdir -p /tmp/archive/2026
+    head -c 30000000 /dev/zero >/tmp/archive/2026/january.tar
+    head -c 9000000 /dev/zero >/tmp/archive/2026/february.tar
+    zavsim act drive gets blank DVD+R
+    zavsim act drive writes at 1500
+    show 0 zavctl disc info
+    show 0 zavctl disc burn /tmp/archive --session open --yes
+
+    tell "A file is added, in a session of its own."
+    head -c 5000000 /dev/zero >/tmp/march.tar
+    show 0 zavctl disc burn /tmp/march.tar --to 2026-1 --yes
+
+    tell "A CD-R is burned and closed. Another burn is refused before anything is written."
+    zavsim act drive loses its disc
+    zavsim act drive gets blank CD-R
+    show 0 zavctl disc burn /tmp/archive --session close --yes
+    show 2 zavctl disc burn /tmp/archive --yes
+
+    tell "A CD-RW is full, and erased."
+    zavsim act drive loses its disc
+    zavsim act drive gets complete CD-RW with 600 MB used
+    show 0 zavctl disc blank --yes
+
+    tell "A burn is stopped half way: the disc's state is told, and what helps."
+    zavsim act drive writes at 500
+    zavctl disc burn /tmp/archive --yes > >(sed -u 's/^/burn:  /') 2>&1 &
+    local burn=$! left=300 status=0
+    until [ "$(burned)" -ge 40 ]; do
+        left=$((left - 1))
+        [ $left -gt 0 ] || fail "the burn makes no progress"
+        sleep $((scale / 10))
+    done
+    show 0 zavctl disc cancel --wait
+    wait "$burn" || status=$?
+    [ $status -eq 2 ] || fail "exit status $status of a burn that was stopped"
+    pause 1
+    show 0 zavctl disc blank --yes
 }
 
 "$2_scene"
