@@ -113,7 +113,6 @@ void disc_report(Bytes bytes) {
     Pieces(bytes, 80).each([&info](char *line) { zav::read_atip_line(line, info); });
     zav::read_disc_status(static_cast<unsigned char>(status), info);
     Pieces(bytes, 80).each([&info](char *line) { zav::read_session_offsets(line, info); });
-    require(info.discAvailableSize <= info.discTotalSize, "more room than the disc has");
     Pieces(bytes, 80).each([&info](char *line) { zav::read_used_space(line, info); });
     require(info.discTotalSize >= 0, "a disc of less than nothing");
 }
