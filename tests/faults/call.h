@@ -26,7 +26,8 @@ int running_function();
 int blocks_held();
 void begin_call();
 
-std::vector<Function> &functions();
+const std::vector<Function> &functions();
+const Function &function_named(const char *name);
 
 // The library has ended the process. Some queries may.
 void ended_by_library();
