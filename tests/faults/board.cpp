@@ -1,6 +1,7 @@
 #include "board.h"
 
 #include "call.h"
+#include "distortion.h"
 
 #include <atomic>
 #include <cstdarg>
@@ -51,7 +52,7 @@ int occurrence_of(const Point &point, std::size_t count) {
     return seen;
 }
 
-bool reached(const char *call, const void *caller, bool may_be_short) {
+bool reached(const char *call, const void *caller, bool may_be_short, std::size_t output) {
     const int function = running_function();
     if (board == nullptr || function < 0 || board->finished || !in_library(caller))
         return false;
@@ -59,8 +60,9 @@ bool reached(const char *call, const void *caller, bool may_be_short) {
     if (index >= kMostPoints)
         return false;
     ++board->count;
-    Point point = {call, reinterpret_cast<std::uintptr_t>(caller) - library().begin, function, 0,
-                   may_be_short};
+    Point point = {call,         reinterpret_cast<std::uintptr_t>(caller) - library().begin,
+                   function,     0,
+                   may_be_short, output};
     point.occurrence = occurrence_of(point, index);
     board->points[index] = point;
     if (board->target < 0 || index != static_cast<std::size_t>(board->target))
@@ -77,15 +79,21 @@ bool in_library(const void *caller) {
 }
 
 bool fails(const char *call, const void *caller) {
-    return reached(call, caller, false);
+    return board != nullptr && !board->tools && reached(call, caller, false, 0);
 }
 
 bool fails(const char *call, const void *caller, bool &halved) {
     halved = false;
-    if (!reached(call, caller, true))
+    if (board == nullptr || board->tools || !reached(call, caller, true, 0))
         return false;
     halved = board->fate == Fate::is_short;
     return !halved;
+}
+
+void answer_wrongly(harness::Outcome &outcome, const void *caller) {
+    if (board != nullptr && board->tools &&
+        reached("a command", caller, false, outcome.output.size()))
+        distort_answer(outcome, board->fate, board->cut);
 }
 
 void block_given(void *memory, const void *caller) {

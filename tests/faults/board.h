@@ -3,15 +3,36 @@
 // plans.
 #pragma once
 
+#include "harness.h"
+
 #include <cstddef>
 #include <cstdint>
 
 namespace faults {
 
+// What becomes of the call.
 enum class Fate : int {
     fails,
-    is_short
-}; // short: reads and writes do half of what they were asked
+    is_short, // a read or a write does half of what it was asked for
+    // The command that it runs answers wrongly:
+    is_missing,
+    is_not_executable,
+    prints_nothing,
+    ends_no_line,
+    prints_long_lines,
+    prints_nuls,
+    prints_garbage,
+    ends_with_an_error,
+    is_killed,
+    warns_first,
+    speaks_another_language,
+    ends_lines_twice, // with a carriage return, too
+    repeats_itself,
+    tells_huge_numbers,
+    tells_negative_numbers,
+    is_cut, // after the bytes that the board says
+};
+constexpr Fate kFirstWrongAnswer = Fate::is_missing;
 
 // One call of the C library by the library.
 struct Point {
@@ -20,6 +41,7 @@ struct Point {
     int function;          // the exported function that was called, by its number
     int occurrence;        // of that place within that call, 2 from the third on
     bool may_be_short;
+    std::size_t output; // bytes that the command has printed
 };
 
 constexpr std::size_t kMostPoints = 20000;
@@ -28,6 +50,8 @@ constexpr std::size_t kMostFunctions = 160;
 struct Board {
     int target;        // the point that is to fail, -1: none
     Fate fate;         // how
+    std::size_t cut;   // where, see Fate::is_cut
+    bool tools;        // commands that answer are met, not calls that fail
     bool fired;        // it has
     bool finished;     // the call in which it has is over
     bool overlapping;  // several threads were in the library at once: points have no order
@@ -43,6 +67,11 @@ extern Board *board;
 bool fails(const char *call, const void *caller);
 // The same for a call that may also do half of its work.
 bool fails(const char *call, const void *caller, bool &halved);
+
+// The program's command: what it printed and how it ended.
+void answer_wrongly(harness::Outcome &outcome, const void *caller);
+
+const char *name_of(Fate fate);
 
 // Heap blocks that the library has asked for.
 void block_given(void *memory, const void *caller);

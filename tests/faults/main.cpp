@@ -3,6 +3,7 @@
 // each of them, in a process of its own. A place in the library is let fail in at most so many
 // tests.
 #include "call.h"
+#include "distortion.h"
 
 #include <csignal>
 #include <cstdio>
@@ -29,6 +30,8 @@ struct Tally {
 };
 
 struct Options {
+    bool tools = false;         // commands answer wrongly, in place of calls that fail
+    std::size_t every_cut = 80; // answers up to so many bytes are cut at each of them
     int per_place = 2;
     std::string filter = "*";
 };
@@ -45,7 +48,7 @@ class Campaign {
     }
 
     void test(const std::string &name) {
-        run(name, -1, Fate::fails);
+        run(name, -1, {Fate::fails});
         if (board->complaint[0] != '\0') {
             ++unfit_;
             std::printf("FAILED %s, where nothing fails: %s\n", name.c_str(), board->complaint);
@@ -95,30 +98,49 @@ class Campaign {
             std::make_tuple(point.function, point.caller, std::min(point.occurrence, 1));
         if (++seen_[place] > options_.per_place)
             return;
-        attempt(name, point, index, Fate::fails, tally);
+        if (!options_.tools)
+            attempt(name, point, index, {Fate::fails}, tally);
         if (point.may_be_short)
-            attempt(name, point, index, Fate::is_short, tally);
+            attempt(name, point, index, {Fate::is_short}, tally);
+        if (options_.tools)
+            answers(name, point, index, tally);
     }
 
-    void attempt(const std::string &name, const Point &point, int index, Fate fate, Tally &tally) {
+    void answers(const std::string &name, const Point &point, int index, Tally &tally) {
+        for (const Fate fate : wrong_answers(point.output))
+            attempt(name, point, index, {fate}, tally);
+        const std::size_t cuts = point.output <= options_.every_cut ? point.output : 0;
+        for (std::size_t cut = 1; cut < cuts; ++cut)
+            attempt(name, point, index, {Fate::is_cut, cut}, tally);
+    }
+
+    struct Blow {
+        Fate fate;
+        std::size_t cut = 0;
+    };
+
+    void attempt(const std::string &name, const Point &point, int index, const Blow &blow,
+                 Tally &tally) {
         ++tally.runs;
-        run(name, index, fate);
+        run(name, index, blow);
         if (board->complaint[0] == '\0' && !board->fired)
             complain("the call was not met again");
         if (board->complaint[0] == '\0')
             return;
         ++tally.failures;
-        std::printf("FAILED %s: call %d, %s at 0x%zx %s: %s\n", name.c_str(), index, point.call,
-                    static_cast<std::size_t>(point.caller),
-                    fate == Fate::fails ? "fails" : "is short", board->complaint);
+        std::printf("FAILED %s: call %d, %s at 0x%zx %s (%zu): %s\n", name.c_str(), index,
+                    point.call, static_cast<std::size_t>(point.caller), name_of(blow.fate),
+                    blow.cut, board->complaint);
         std::fflush(stdout);
     }
 
     // One test in a process of its own.
-    static void run(const std::string &name, int target, Fate fate) {
+    void run(const std::string &name, int target, const Blow &blow) const {
         std::memset(board, 0, offsetof(Board, points));
         board->target = target;
-        board->fate = fate;
+        board->fate = blow.fate;
+        board->cut = blow.cut;
+        board->tools = options_.tools;
         std::fflush(stdout);
         const pid_t child = fork();
         if (child == 0) {
@@ -176,10 +198,13 @@ Options options_from(int argc, char **argv) {
         const std::string word = argv[i];
         if (word == "--all")
             options.per_place = 1 << 30;
-        else if (word.starts_with("--filter="))
+        else if (word == "--tools") {
+            options.tools = true;
+            options.per_place = 1;
+        } else if (word.starts_with("--filter="))
             options.filter = word.substr(9);
         else {
-            std::fputs("usage: fault_tests [--all] [--filter=TEST-OR-PREFIX*]\n", stderr);
+            std::fputs("usage: fault_tests [--tools] [--all] [--filter=TEST-OR-PREFIX*]\n", stderr);
             std::exit(64);
         }
     }
@@ -199,6 +224,8 @@ int main(int argc, char **argv) {
     testing::InitGoogleTest(&none, argv);
     harness::call_fails = fails;
     harness::allocated = block_given;
+    if (options.tools)
+        harness::distort = answer_wrongly;
     Campaign campaign(options);
     for (const std::string &name : test_names())
         if (fits(name, options.filter))

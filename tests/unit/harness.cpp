@@ -52,6 +52,7 @@ void note_command(const char *command) {
 } // namespace
 
 bool (*call_fails)(const char *function, const void *caller) = nullptr;
+void (*distort)(Outcome &outcome, const void *caller) = nullptr;
 void (*allocated)(void *memory, const void *caller) = nullptr;
 
 LogRow row(const std::string &ident, int priority, const std::string &text) {
@@ -99,6 +100,57 @@ bool is_drive_request(unsigned long request) {
 }
 
 // What tests put into the root. The bare root itself comes with the directories.
+// The file that a command's output goes to; "" if it goes nowhere else.
+std::string file_of(const std::string &command) {
+    const size_t arrow = command.rfind('>');
+    if (arrow == std::string::npos)
+        return "";
+    const size_t begin = command.find('/', arrow);
+    const size_t end = command.find_first_of(" ;|", begin);
+    const std::string file = begin == std::string::npos ? "" : command.substr(begin, end - begin);
+    return fs::is_regular_file(file) ? file : "";
+}
+
+std::string content_of(const std::string &file) {
+    std::ostringstream text;
+    text << std::ifstream(file, std::ios::binary).rdbuf();
+    return text.str();
+}
+
+int distorted(const char *command, int status, const void *caller) {
+    const std::string file = file_of(command);
+    Outcome outcome = {content_of(file), status};
+    distort(outcome, caller);
+    if (!file.empty())
+        std::ofstream(file, std::ios::binary) << outcome.output;
+    return outcome.status;
+}
+
+// A pipe that prints that, of a process that ends so.
+FILE *pipe_of(const Outcome &outcome, const char *mode) {
+    const auto real_popen = real<FILE *(const char *, const char *)>("popen");
+    std::ofstream("/scratch/answer", std::ios::binary) << outcome.output;
+    const std::string end = WIFSIGNALED(outcome.status)
+                                ? "kill -" + std::to_string(WTERMSIG(outcome.status)) + " $$"
+                                : "exit " + std::to_string(WEXITSTATUS(outcome.status));
+    FILE *pipe = real_popen(("cat /scratch/answer; " + end).c_str(), mode);
+    if (pipe != nullptr) { // the next answer may be written before this one is read
+        const int first = fgetc(pipe);
+        if (first != EOF)
+            ungetc(first, pipe);
+    }
+    return pipe;
+}
+
+Outcome outcome_of(FILE *pipe) {
+    Outcome outcome;
+    char piece[4096];
+    for (size_t got; (got = fread(piece, 1, sizeof piece, pipe)) > 0;)
+        outcome.output.append(piece, got);
+    outcome.status = real<int(FILE *)>("pclose")(pipe);
+    return outcome;
+}
+
 constexpr const char *kWipedDirectories[] = {
     "/etc/Kiru",        "/proc/zav",      "/proc/scsi",        "/sys/class",   "/dev/sata",
     "/dev/swraid",      "/dev/iscsiraid", "/dev/hwraid",       "/dev/sasraid", "/dev/DataVG1",
@@ -233,14 +285,19 @@ int system(const char *command) {
     harness::note_command(command);
     if (harness::record().before_command)
         harness::record().before_command(command);
+    int status = 0;
     if (harness::record().shell) {
         const harness::Answer answer = harness::record().shell->answer(command);
         errno = answer.error;
-        return answer.starts ? answer.status << 8 : -1;
+        status = answer.starts ? answer.status << 8 : -1;
+    } else if (harness::record().system_status) {
+        status = *harness::record().system_status;
+    } else {
+        status = harness::real<int(const char *)>("system")(command);
     }
-    if (harness::record().system_status)
-        return *harness::record().system_status;
-    return harness::real<int(const char *)>("system")(command);
+    if (harness::distort == nullptr || status == -1)
+        return status;
+    return harness::distorted(command, status, __builtin_return_address(0));
 }
 
 FILE *popen(const char *command, const char *mode) {
@@ -249,7 +306,6 @@ FILE *popen(const char *command, const char *mode) {
         return nullptr;
     }
     harness::note_command(command);
-    const auto real_popen = harness::real<FILE *(const char *, const char *)>("popen");
     harness::Answer answer;
     if (harness::record().shell)
         answer = harness::record().shell->answer(command);
@@ -257,17 +313,16 @@ FILE *popen(const char *command, const char *mode) {
         errno = EMFILE;
         return nullptr;
     }
-    if (!harness::record().shell)
-        return real_popen(command, mode);
-    std::ofstream("/scratch/answer", std::ios::binary) << answer.output;
-    const std::string stand_in = "cat /scratch/answer; exit " + std::to_string(answer.status);
-    FILE *pipe = real_popen(stand_in.c_str(), mode);
-    if (pipe != nullptr) { // the next answer may be written before this one is read
-        const int first = fgetc(pipe);
-        if (first != EOF)
-            ungetc(first, pipe);
+    harness::Outcome outcome = {answer.output, answer.status << 8};
+    if (!harness::record().shell) {
+        FILE *pipe = harness::real<FILE *(const char *, const char *)>("popen")(command, mode);
+        if (harness::distort == nullptr || pipe == nullptr)
+            return pipe;
+        outcome = harness::outcome_of(pipe);
     }
-    return pipe;
+    if (harness::distort != nullptr)
+        harness::distort(outcome, __builtin_return_address(0));
+    return harness::pipe_of(outcome, mode);
 }
 
 int pclose(FILE *pipe) {

@@ -93,6 +93,13 @@ Record &record();
 // Set by a program that lets single calls of the library fail: every stand-in for a function of the
 // C library asks it, with the function's name and where it is called from, before it does anything.
 extern bool (*call_fails)(const char *function, const void *caller);
+// What a command has printed, to its pipe or into the file that its output was sent to, and how it
+// ended, as wait(2) tells it. Set by a program that has tools answer wrongly: may change both.
+struct Outcome {
+    std::string output;
+    int status = 0;
+};
+extern void (*distort)(Outcome &outcome, const void *caller);
 // Told of memory that a stand-in has given out.
 extern void (*allocated)(void *memory, const void *caller);
 
