@@ -318,6 +318,44 @@ TEST_F(Burning, TakesADirectoryWhateverItIsCalled) {
               "'/scratch/a b; touch ran' &>/tmp/progress.outfile");
 }
 
+// The commands as they were made for names that a shell would act upon, given to a shell.
+TEST_F(Burning, RunsNothingThatANameHolds) {
+    dvd("1Bh, DVD+R", "blank");
+    record().shell->first("du -sL", prints("1\n"));
+    for (const std::string name : {"$(touch ran)", "`touch ran`", "x; touch ran", "x\ntouch ran",
+                                   "x|touch ran", "x&touch ran", "'\"; touch ran #"}) {
+        std::string directory = "/scratch/" + name;
+        std::string file = directory + "/" + name;
+        std::string on_disc = name;
+        put(file, "x");
+        EXPECT_EQ(zavCDBurn(directory.data(), 1), ZAV_RC_OK) << name;
+        EXPECT_EQ(zavCDBurnEx(directory.data(), on_disc.data(), 1), ZAV_RC_OK) << name;
+        EXPECT_EQ(zavCDBurnFile(file.data()), ZAV_RC_OK) << name;
+        EXPECT_EQ(zavCDBurnFileEx(file.data(), on_disc.data()), ZAV_RC_OK) << name;
+    }
+    const Lines commands = record().commands;
+    record().shell.reset();
+    for (const std::string &command : commands) {
+        if (command.find("touch") == std::string::npos)
+            continue;
+        EXPECT_NE(system(("cd /scratch && " + command).c_str()), -1);
+    }
+    EXPECT_FALSE(exists("/scratch/ran"));
+}
+
+TEST_F(Burning, RunsNothingThatTheSessionsOfACdHold) {
+    cd(1, std::string(kCdR) + "0,11702$(touch /scratch/ran)\n");
+    EXPECT_EQ(burn("/scratch/tree", 1), ZAV_RC_OK);
+    std::string next_session;
+    for (const std::string &command : record().commands)
+        if (command.find("mkisofs -C") == 0)
+            next_session = command;
+    ASSERT_NE(next_session.find("'0,11702$(touch /scratch/ran)'"), std::string::npos);
+    record().shell.reset();
+    EXPECT_NE(system(next_session.c_str()), -1);
+    EXPECT_FALSE(exists("/scratch/ran"));
+}
+
 TEST_F(Burning, TakesALongPath) {
     dvd("1Bh, DVD+R", "blank");
     record().shell->first("du -sL", prints("1\n"));

@@ -268,7 +268,7 @@ Plan format_plan(const BurnerFacts &facts) {
     plan.heading = "Format the disc in the drive for packet writing";
     if (!refuse_drive(facts, plan))
         return plan;
-    plan.heading = fmt::format("Format the {} for packet writing", disc_words(disc));
+    plan.heading = fmt::format("Format for packet writing: {}", disc_words(disc));
     if (!can_format(disc)) {
         refuse(plan,
                fmt::format("only a DVD+RW or a CD-RW can be formatted: {}", disc_words(disc)));
