@@ -183,7 +183,7 @@ std::vector<std::string> test_names() {
         const std::string suite_name = suite.name();
         // These have processes and threads of their own in the library, or ask it thousands of
         // times.
-        if (suite_name.ends_with("DeathTest") || suite_name == "Turns" ||
+        if (suite_name.ends_with("DeathTest") || suite_name == "Turns" || suite_name == "Caller" ||
             suite_name.starts_with("Random"))
             continue;
         for (int j = 0; j < suite.total_test_count(); ++j)
