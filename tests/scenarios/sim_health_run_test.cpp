@@ -1,7 +1,9 @@
 // Load, UPS and network as programs and the library's readers meet them.
 #include "sim_runner.hpp"
 
+#include <fstream>
 #include <gtest/gtest.h>
+#include <sstream>
 
 namespace {
 
@@ -130,10 +132,10 @@ TEST(NetworkReaders, SeeTheBondFailOver) {
 }
 
 TEST(Ethtool, ComplainsOfAPortThatIsNotThereAsACurrentOneDoes) {
-    const Outcome run = on_appliance(
-        "/sbin/ethtool eth2 > /tmp/said 2>&1; echo $?; cmp /tmp/said " + std::string(CAPTURES) +
-        "/bond-active-backup/ethtool-eth2-missing.txt && echo same");
-    EXPECT_EQ(run.out, "75\nsame\n");
+    std::ostringstream said; // read here: an appliance does not see the tests' data everywhere
+    said << std::ifstream(CAPTURES "/bond-active-backup/ethtool-eth2-missing.txt").rdbuf();
+    ASSERT_FALSE(said.str().empty());
+    EXPECT_EQ(on_appliance("/sbin/ethtool eth2 2>&1; echo $?").out, said.str() + "75\n");
 }
 
 TEST(Ethtool, RefusesWhatIsNotSimulated) {
