@@ -70,7 +70,8 @@ template <class Value>
 Value taken(Bytes &bytes) {
     Value value = {};
     const std::size_t size = std::min(sizeof value, bytes.size());
-    std::memcpy(&value, bytes.data(), size);
+    if (size > 0)
+        std::memcpy(&value, bytes.data(), size);
     bytes = bytes.subspan(size);
     return value;
 }

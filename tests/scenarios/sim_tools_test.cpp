@@ -245,11 +245,11 @@ TEST(Faults, AToolHangsInApplianceTime) {
 }
 
 TEST(Faults, HappenByScenario) {
-    const ScratchFile scenario("at 5s tool mdadm prints \"busy\"\n");
+    const ScratchFile scenario("at 200s tool mdadm prints \"busy\"\n"); // ten of the host's
     const Outcome run =
-        on_appliance("mdadm --detail /dev/md0 | head -n 1; sleep 10; mdadm --detail "
+        on_appliance("mdadm --detail /dev/md0 | head -n 1; sleep 210; mdadm --detail "
                      "/dev/md0",
-                     {"--scenario", scenario.path(), "--time-scale", "50"});
+                     {"--scenario", scenario.path(), "--time-scale", "20"});
     EXPECT_EQ(run.out, "/dev/md0:\nbusy");
 }
 
