@@ -5,6 +5,8 @@
 
 #include <fmt/format.h>
 
+#include <algorithm>
+
 namespace zavctl {
 
 namespace {
@@ -76,6 +78,17 @@ Answer eject() {
     return {"disc eject", "", {action_section(eject_report(failure))}};
 }
 
+// Those of them that still run. The stopped job may ask the drive by then, with a tool of the same
+// name.
+std::vector<RunningTool> left_of(const std::vector<RunningTool> &before) {
+    std::vector<RunningTool> left;
+    for (const RunningTool &tool : running_tools())
+        if (std::any_of(before.begin(), before.end(),
+                        [&tool](const RunningTool &other) { return other.pid == tool.pid; }))
+            left.push_back(tool);
+    return left;
+}
+
 Answer cancel(bool wait) {
     CancelReport report;
     report.waited = wait;
@@ -86,7 +99,7 @@ Answer cancel(bool wait) {
         library::cancel_job_and_wait();
     else
         library::cancel_job();
-    report.after = running_tools();
+    report.after = left_of(report.before);
     return {"disc cancel", "", {cancel_section(report)}};
 }
 
