@@ -159,7 +159,9 @@ int trans_mdname(char *metaname, char *zavname);
  */
 
 /** Opens the semaphore of `key`, creating it with value 1 (free) if need be, and stores its
- *  identifier in `*sem_id`. 128 if `sem_id` is null. */
+ *  identifier in `*sem_id`. 128 if `sem_id` is null. One that was made by a process which was
+ * killed before it could set the value, and so would be waited for for ever, is made anew after a
+ * second. */
 int semaphore_get(int key, int *sem_id);
 
 /** Sets the value to 1. */

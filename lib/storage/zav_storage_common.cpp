@@ -8,11 +8,15 @@
 #include <cstring>
 #include <sys/ipc.h>
 #include <sys/sem.h>
+#include <time.h>
 
 namespace {
 
 constexpr int kMode = 0666; // processes of any user share a lock
 constexpr int kLogNumber = 3;
+constexpr long kStepMillis = 10;
+constexpr long kCreatorMillis =
+    1000; // patience with whoever made a semaphore and is to set it free
 
 // `format` takes the key, the identifier, the error number and its text.
 #define LOG_FAILURE(format, key, sem_id)                                                           \
@@ -46,29 +50,64 @@ bool change_value(int sem_id, short step) {
     return semop(sem_id, &operation, 1) == 0;
 }
 
-} // namespace
-
 // A new semaphore that was not set free would hold up everybody for ever; the next caller makes
 // another.
-static void remove_unset(int created) {
+void remove_unset(int created) {
     if (created >= 0)
         semctl(created, 0, IPC_RMID);
 }
 
+// At 0 without ever having been taken. Asked in this order, so that one which is set free and taken
+// in between does not look like it.
+bool is_unset(int sem_id) {
+    semid_ds about = {};
+    semun argument = {};
+    argument.buf = &about;
+    return semctl(sem_id, 0, GETVAL) == 0 && semctl(sem_id, 0, IPC_STAT, argument) == 0 &&
+           about.sem_otime == 0;
+}
+
+// Whoever made it was killed before it could set it free.
+bool stays_unset(int sem_id) {
+    const timespec step = {0, kStepMillis * 1'000'000};
+    for (long waited = 0; is_unset(sem_id); waited += kStepMillis) {
+        if (waited >= kCreatorMillis)
+            return true;
+        nanosleep(&step, nullptr);
+    }
+    return false;
+}
+
+// The identifiers of the semaphore, and of the one that had to be made for it; -1 where there is
+// none.
+struct Opened {
+    int found;
+    int created;
+};
+
+Opened open_semaphore(int key, const char *caller) {
+    const int created = semget(key, 1, IPC_CREAT | IPC_EXCL | kMode);
+    if (created < 0) {
+        ZAV_TRACE(zav::kTraceStep, "%s() - Semaphore[0x%x] Exist.\n", caller,
+                  static_cast<unsigned>(key));
+        return {semget(key, 1, kMode), created};
+    }
+    ZAV_TRACE(zav::kTraceStep, "%s() - Semaphore[%d][0x%x] Not Exist.\n", caller, created,
+              static_cast<unsigned>(key));
+    return {semget(key, 1, IPC_CREAT | kMode), created};
+}
+
+} // namespace
+
 int semaphore_get(int key, int *sem_id) {
     if (sem_id == nullptr)
         return ZAV_RC_ERR;
-    const int created = semget(key, 1, IPC_CREAT | IPC_EXCL | kMode);
-    int found;
-    if (created < 0) {
-        ZAV_TRACE(zav::kTraceStep, "%s() - Semaphore[0x%x] Exist.\n", __func__,
-                  static_cast<unsigned>(key));
-        found = semget(key, 1, kMode);
-    } else {
-        ZAV_TRACE(zav::kTraceStep, "%s() - Semaphore[%d][0x%x] Not Exist.\n", __func__, created,
-                  static_cast<unsigned>(key));
-        found = semget(key, 1, IPC_CREAT | kMode);
+    Opened set = open_semaphore(key, __func__);
+    if (set.created < 0 && set.found >= 0 && stays_unset(set.found)) {
+        remove_unset(set.found);
+        set = open_semaphore(key, __func__);
     }
+    const auto [found, created] = set;
     if (found < 0) {
         const int error = errno;
         ZAV_LOG(zav::kAlert, kLogNumber, "semget[0x%x] failed!!. errno[%d][%s]",

@@ -2,6 +2,7 @@
 #include "harness.h"
 
 #include <cerrno>
+#include <chrono>
 #include <csignal>
 #include <cstring>
 #include <sys/sem.h>
@@ -122,6 +123,35 @@ TEST_F(Locks, AHeldLockIsWaitedFor) {
     released = true;
     EXPECT_EQ(semaphore_v(id, kKey), 0);
     waiter.join();
+}
+
+TEST_F(Locks, OneWhoseMakerWasKilledBeforeItSetItFreeIsMadeAnew) {
+    const int made = semget(kKey, 1, IPC_CREAT | 0666);
+    const int id = get();
+    EXPECT_NE(id, made);
+    EXPECT_EQ(value(id), 1);
+}
+
+TEST_F(Locks, OneThatItsMakerIsAboutToSetFreeIsWaitedFor) {
+    const int made = semget(kKey, 1, IPC_CREAT | 0666);
+    std::thread maker([&] {
+        std::this_thread::sleep_for(std::chrono::milliseconds(50));
+        set_semvalue(made, kKey);
+    });
+    EXPECT_EQ(get(), made);
+    EXPECT_EQ(value(made), 1);
+    maker.join();
+}
+
+TEST_F(Locks, OneThatIsHeldIsTheSameForTheNext) {
+    const int id = get();
+    ASSERT_EQ(semaphore_p(id, kKey), 0);
+    EXPECT_EQ(in_child([&] {
+                  int found = -1;
+                  return semaphore_get(kKey, &found) == 0 && found == id ? 7 : 8;
+              }),
+              7);
+    EXPECT_EQ(semaphore_v(id, kKey), 0);
 }
 
 TEST_F(Locks, SetMakesThemFree) {
