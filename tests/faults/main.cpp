@@ -121,8 +121,10 @@ class Campaign {
 
     void attempt(const std::string &name, const Point &point, int index, const Blow &blow,
                  Tally &tally) {
-        ++tally.runs;
         run(name, index, blow);
+        if (board->overlapping) // they met this time only
+            return;
+        ++tally.runs;
         if (board->complaint[0] == '\0' && !board->fired)
             complain("the call was not met again");
         if (board->complaint[0] == '\0')
