@@ -5,18 +5,22 @@
 
 namespace bench {
 
-// What mdadm and /proc/mdstat say of a healthy array.
-extern const std::string detail_text;
-extern const std::string mdstat_text;
-
-// A metadata backup of a group with that many physical and logical volumes.
-std::string backup_text(int physical, int logical);
-
-// A RAID controller's report, its unit's section behind that many lines.
-std::string report_text(int lines_before);
-
 // Lays down files, device names and tools. False, with a word to the user, outside a private root:
 // the files belong to the system there.
 bool set_up_appliance();
+
+// A file with its directories. A link of that name goes first: it leads to the system's own file.
+void put(const std::string &path, const std::string &text);
+
+// A tool that prints this, see tool.c.
+void put_tool(const std::string &path, const std::string &answer);
+
+// Which model it is from now on.
+constexpr const char *kSoftwareRaid = "SV-2860\n";
+constexpr const char *kHardwareRaid = "SV-2980\n";
+void become(const char *product);
+
+// The directory of the built programs and libraries.
+std::string build_directory();
 
 } // namespace bench

@@ -1,23 +1,23 @@
-// How much longer does a library call take than the command that it runs? Both are timed in turn,
-// pair by pair, so that whatever else the machine does disturbs both alike.
+// How much longer does a library call take than what it relies upon? Both are timed in turn, pair
+// by pair, so that whatever else the machine does disturbs both alike.
 #pragma once
 
 #include <cstddef>
+#include <functional>
 #include <string>
 #include <vector>
 
 namespace bench {
 
-// One query. Either function ends the program if it did not get the answer that it should.
-struct Query {
-    const char *name;
-    const char *command; // what the library runs for it, byte for byte
-    void (*bare)(const char *command);
-    void (*call)();
-};
+// Throws if it did not get the answer that it should.
+using Action = std::function<void()>;
+
+// Microseconds that the action takes.
+double microseconds(const Action &action);
+
+double median(std::vector<double> values);
 
 struct Comparison {
-    std::string name;
     double bare; // microseconds, median
     double call;
     double ratio; // median of call / bare over the pairs
@@ -26,9 +26,31 @@ struct Comparison {
     std::size_t pairs;
 };
 
-Comparison compare(const Query &query, std::size_t pairs);
+class Pairs {
+  public:
+    // Each time that is taken is that of so many calls, for what is too short for the clock.
+    Pairs(Action bare, Action call, std::size_t calls = 1)
+        : bare_(std::move(bare)), call_(std::move(call)), calls_(calls) {}
 
-// Prints the comparisons as a table; false if a ratio is over `limit`.
-bool report(const std::vector<Comparison> &comparisons, double limit);
+    // Adds to the pairs that were measured before.
+    void measure(std::size_t pairs);
+
+    // How many pairs fit into that time, going by those measured; no fewer than `least`, and no
+    // more than `most`.
+    std::size_t fitting(double seconds, std::size_t least, std::size_t most) const;
+
+    Comparison compared() const;
+
+    void forget();
+
+  private:
+    double time(const Action &action) const;
+
+    Action bare_;
+    Action call_;
+    std::size_t calls_;
+    std::vector<double> bare_times_;
+    std::vector<double> call_times_;
+};
 
 } // namespace bench

@@ -1,63 +1,22 @@
 #include "queries.h"
 
+#include "appliance.h"
+#include "commands.h"
+#include "paired.h"
+#include "require.h"
+#include "texts.h"
 #include "zav_api.h"
 
+#include <algorithm>
 #include <cstdio>
-#include <cstdlib>
+#include <string>
+#include <vector>
 
 namespace bench {
 
 namespace {
 
-// A wrong answer is often a quick one: it must not be measured.
-void require(bool right, const char *what) {
-    if (right)
-        return;
-    fprintf(stderr, "zav_bench: %s did not give the expected answer\n", what);
-    exit(1);
-}
-
-// ---- The bare commands, as a program without the library would run them. ----
-
-void run(const char *command) {
-    require(system(command) == 0, command);
-}
-
-void read_all(const char *command) {
-    FILE *output = popen(command, "r");
-    require(output != nullptr, command);
-    char text[4096];
-    size_t length = 0;
-    for (size_t got = 0; (got = fread(text, 1, sizeof text, output)) > 0;)
-        length += got;
-    require(pclose(output) == 0 && length > 0, command);
-}
-
-// The commands of a volume group's query.
-void read_group(const char * /*they are these*/) {
-    run("/usr/sbin/vgs &> /etc/Kiru/zav/.vgs");
-    run("cat /etc/Kiru/zav/.vgs | grep DataVG1 &>/dev/null");
-    run("/usr/sbin/vgs DataVG1 &>/dev/null");
-    run("/usr/sbin/vgdisplay DataVG1 &> /etc/Kiru/zav/.vgdisplay.DataVG1");
-    read_all("cat /etc/Kiru/zav/.vgdisplay.DataVG1 | grep \"Cur PV\" | cut -c 12- ");
-    read_all("cat /etc/Kiru/zav/.vgdisplay.DataVG1 | grep \"Cur LV\" | cut -c 12- ");
-    read_all("/usr/sbin/vgdisplay -c DataVG1 2>/dev/null | cut -d ':' -f 12");
-    run("/usr/sbin/vgcfgbackup -f /etc/Kiru/zav/DataVG1 DataVG1 &> /dev/null");
-    read_all("echo /dev/`udevinfo -q symlink -p /block/md1`");
-}
-
-// The commands of the expansion units' query, of which there is one.
-void find_units(const char * /*they are these*/) {
-    read_all("/usr/bin/query_sas.sh");
-    read_all("cat /etc/Kiru/zav/.raidinfo");
-}
-
-void read_port(const char * /*they are these*/) {
-    run("/sbin/ethtool eth0 > /dev/null  2>&1");
-    read_all("/sbin/ethtool eth0 2>&1");
-}
-
-// ---- The library's calls. ----
+// ---- The library's calls ----
 
 void ask_disk() {
     zavDevice disk = {ZAV_DEV_HDD, ZAV_MINDEV_HDD_SATA, 1, 0};
@@ -82,6 +41,39 @@ void ask_group() {
             "zavgetStateLVMVG");
 }
 
+void ask_physical_volume() {
+    zavDevice volume = {ZAV_DEV_LVM, ZAV_MINDEV_LVM_PV, 1, 1};
+    zavLVMState info;
+    require(zavgetStateLVMPV(&volume, &info) == ZAV_RC_OK && info.state == ZAV_LVM_NORMAL &&
+                info.dev.lvmpvdev.dev.disk == 2,
+            "zavgetStateLVMPV");
+}
+
+void ask_logical_volume() {
+    zavDevice volume = {ZAV_DEV_LVM, ZAV_MINDEV_LVM_LV, 1, 1};
+    zavLVMState info;
+    require(zavgetStateLVMLV(&volume, &info) == ZAV_RC_OK && info.state == 0 &&
+                info.dev.lvmlvdev.size == 1,
+            "zavgetStateLVMLV");
+}
+
+void look_for_volume_tools() {
+    require(zavCheckExeFile() == ZAV_RC_OK, "zavCheckExeFile");
+}
+
+void ask_group_of_array() {
+    char array[] = "/dev/md1";
+    char group[128] = "";
+    require(zavGetPVsVG(array, group) == ZAV_RC_OK && std::string(group) == "DataVG1",
+            "zavGetPVsVG");
+}
+
+void ask_usage() {
+    zavDevice volume = {ZAV_DEV_LVM, ZAV_MINDEV_LVM_LV, 1, 1};
+    float usage = -1;
+    require(zavgetFSusage(&volume, &usage) == ZAV_RC_OK && usage >= 0, "zavgetFSusage");
+}
+
 void ask_units() {
     sRBODSet units;
     require(zavGetRBODSet(&units) == ZAV_RC_OK && units.RBOD[0].iExist == 1 &&
@@ -89,12 +81,65 @@ void ask_units() {
             "zavGetRBODSet");
 }
 
-void ask_port() {
-    zavDevice port = {ZAV_DEV_NIC, ZAV_MINDEV_NIC_ETH, 1, 0};
+void ask_identity() {
+    sRBODMap unit = {};
+    unit.rbodid = 1;
+    require(zavGetRBODSN(&unit) == ZAV_RC_OK && std::string(unit.sn) == "Y101", "zavGetRBODSN");
+}
+
+void ask_unit_temperature() {
+    sRBOD unit = {};
+    unit.id = 1;
+    zavRBODState info;
+    require(zavGetStateRBOD(&unit, ZAV_RBOD_TEMP_CPU, &info) == ZAV_RC_OK && info.value == 45.0F,
+            "zavGetStateRBOD");
+}
+
+void ask_interface(int minor_type) {
+    zavDevice interface = {ZAV_DEV_NIC, minor_type, 1, 0};
     zavNetState info;
-    require(zavGetStateNic(&port, &info) == ZAV_RC_OK && info.state == ZAV_NET_UP &&
+    require(zavGetStateNic(&interface, &info) == ZAV_RC_OK && info.state == ZAV_NET_UP &&
                 info.value == 1000,
             "zavGetStateNic");
+}
+
+void ask_port() {
+    ask_interface(ZAV_MINDEV_NIC_ETH);
+}
+
+void ask_bond() {
+    ask_interface(ZAV_MINDEV_NIC_BOND);
+}
+
+void ask_disc(int type) {
+    zavMediaInfo info;
+    require(zavQueryDisc(&info, 0) == ZAV_RC_OK && info.discType == type &&
+                info.discAvailableSize > 0,
+            "zavQueryDisc");
+}
+
+void lay_in_dvd() {
+    put_tool("/usr/bin/dvd+rw-mediainfo", dvd_text);
+}
+
+void ask_dvd() {
+    ask_disc(ZAV_DVD_PLUS_RW);
+}
+
+void lay_in_cd() {
+    put_tool("/usr/bin/dvd+rw-mediainfo", "exit 252\n:-( non-DVD media mounted, exiting...\n");
+}
+
+void ask_cd() {
+    ask_disc(ZAV_CD_R);
+}
+
+void look_for_burner_tools() {
+    require(checkExternalBin() == ZAV_RC_OK, "checkExternalBin");
+}
+
+void ask_progress() {
+    require(zavCDProgress() == 34, "zavCDProgress");
 }
 
 void count_disks() {
@@ -110,24 +155,101 @@ void map_time_zone() {
     require(zavMapArcTimeZone() == 1, "zavMapArcTimeZone");
 }
 
+void nothing() {}
+
+// ---- Which of them are measured ----
+
+struct Query {
+    const char *name;
+    void (*call)();
+    void (*prepare)() = nothing;
+};
+
+// Not repeated, because they are one of these and a check or another: zavGetStateLVM
+// (zavCheckExeFile, and the reader of the minor type), zavGetPVsVGDev (zavGetPVsVG), fillinfo
+// (zavGetRBODSN), and the exported readers (getDiskStateSATA, getRaidStateSW, getNicStateETH,
+// getNicStateBOND). The other sensors of zavGetStateRBOD differ by one line of arithmetic.
+constexpr Query kQueries[] = {
+    {"zavGetStateDisk, SATA disk", ask_disk},
+    {"zavGetStateRaid, software array", ask_array},
+    {"zavgetStateLVMVG, one PV", ask_group},
+    {"zavgetStateLVMPV, on an array", ask_physical_volume},
+    {"zavgetStateLVMLV", ask_logical_volume},
+    {"zavCheckExeFile", look_for_volume_tools},
+    {"zavGetPVsVG", ask_group_of_array},
+    {"zavgetFSusage", ask_usage},
+    {"zavGetRBODSet, one unit", ask_units},
+    {"zavGetRBODSN", ask_identity},
+    {"zavGetStateRBOD, temperature", ask_unit_temperature},
+    {"zavGetStateNic, Ethernet port", ask_port},
+    {"zavGetStateNic, bond", ask_bond},
+    {"zavQueryDisc, DVD", ask_dvd, lay_in_dvd},
+    {"zavQueryDisc, CD", ask_cd, lay_in_cd},
+    {"checkExternalBin", look_for_burner_tools},
+    {"zavCDProgress", ask_progress},
+    {"get_diskcount", count_disks},
+    {"zavMapArcTimeZone", map_time_zone},
+    {"zavSyncConf", synchronise},
+};
+
+// ---- Measuring ----
+
+constexpr std::size_t kWarmUp = 3;
+constexpr std::size_t kLeastPairs = 40;
+constexpr std::size_t kMostPairs = 400;
+constexpr double kSeconds = 3.0;      // for each query
+constexpr double kMoreSeconds = 12.0; // for one that is over the limit, perhaps by chance
+
+bool not_known(const Comparison &row) {
+    return row.ratio > kLimit && row.low <= kLimit;
+}
+
+Verdict verdict_of(const Comparison &row) {
+    if (row.ratio <= kLimit)
+        return Verdict::kKept;
+    return not_known(row) ? Verdict::kNotKnown : Verdict::kBroken;
+}
+
+// The same appliance for both, the process too: a fork costs what the process is large.
+Comparison compare(const Query &query, const std::vector<Command> &commands) {
+    Pairs pairs([&] { run_bare(commands); }, query.call);
+    pairs.measure(kWarmUp);
+    const std::size_t first = pairs.fitting(kSeconds, kLeastPairs, kMostPairs);
+    const std::size_t more = pairs.fitting(kMoreSeconds, kLeastPairs, 4 * kMostPairs);
+    pairs.forget();
+    pairs.measure(first);
+    // What was measured counts on: a row is not tried until it fits.
+    if (not_known(pairs.compared()))
+        pairs.measure(more);
+    return pairs.compared();
+}
+
+Verdict print(const Query &query, std::size_t commands, const Comparison &row) {
+    static constexpr const char *kWords[] = {"OK", "NOT KNOWN", "OVER"};
+    const Verdict verdict = verdict_of(row);
+    printf("%-34s %8zu %6zu %10.1f %10.1f %7.3f  %.3f .. %.3f  %s\n", query.name, commands,
+           row.pairs, row.bare, row.call, row.ratio, row.low, row.high,
+           kWords[static_cast<int>(verdict)]);
+    fflush(stdout);
+    return verdict;
+}
+
 } // namespace
 
-const std::vector<Query> &queries() {
-    static const std::vector<Query> all = {
-        {"zavGetStateDisk, healthy disk", "smartctl -H -d ata /dev/sata/disk1 &>/dev/null", run,
-         ask_disk},
-        {"zavGetStateRaid, software array", "/sbin/mdadm --detail /dev/md1", read_all, ask_array},
-        {"zavgetStateLVMVG, one PV", "", read_group, ask_group},
-        {"zavGetRBODSet, one unit", "", find_units, ask_units},
-        {"zavGetStateNic, Ethernet port", "", read_port, ask_port},
-        {"get_diskcount", "cat /proc/scsi/scsi | grep \"Vendor: ATA\" | wc -l", read_all,
-         count_disks},
-        {"zavMapArcTimeZone",
-         R"(cat /etc/sysconfig/clock | grep "ZONE=" | cut -d "\"" -f 2 | cut -d "/" -f 2)",
-         read_all, map_time_zone},
-        {"zavSyncConf", "/usr/bin/syncConf.sh", run, synchronise},
-    };
-    return all;
+Verdict compare_queries() {
+    printf("\nWhole calls beside their commands run bare (medians of pairs timed in turn; limit "
+           "%.2f)\n%-34s %8s %6s %10s %10s %7s  %s\n",
+           kLimit, "query", "commands", "pairs", "bare us", "call us", "ratio", "95 % interval");
+    Verdict worst = Verdict::kKept;
+    for (const Query &query : kQueries) {
+        query.prepare();
+        const std::vector<Command> commands = commands_of(query.call);
+        require(!commands.empty(), query.name);
+        worst = std::max(worst, print(query, commands.size(), compare(query, commands)));
+    }
+    if (worst == Verdict::kNotKnown)
+        puts("NOT KNOWN: the limit lies within the interval; measure again on a quieter machine.");
+    return worst;
 }
 
 } // namespace bench

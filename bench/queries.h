@@ -1,12 +1,17 @@
-// The queries that run a command, each with that command.
+// The queries that run commands, beside those commands.
 #pragma once
-
-#include "paired.h"
-
-#include <vector>
 
 namespace bench {
 
-const std::vector<Query> &queries();
+enum class Verdict {
+    kKept,
+    kNotKnown, // a ratio is over the limit, and the limit within its confidence interval
+    kBroken,
+};
+
+// A call may take so many times as long as its commands.
+constexpr double kLimit = 1.05;
+
+Verdict compare_queries();
 
 } // namespace bench

@@ -1,7 +1,7 @@
 // The pure part of the hardware-RAID queries: the controller's report.
 #include "common/raid_report.h"
 
-#include "appliance.h"
+#include "texts.h"
 
 #include <benchmark/benchmark.h>
 #include <cstdio>

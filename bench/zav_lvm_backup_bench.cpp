@@ -1,7 +1,7 @@
 // The pure part of a volume group's query: its metadata backup.
 #include "storage/zav_lvm_backup.h"
 
-#include "appliance.h"
+#include "texts.h"
 
 #include <algorithm>
 #include <benchmark/benchmark.h>

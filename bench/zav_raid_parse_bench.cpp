@@ -1,7 +1,7 @@
 // The pure part of the software arrays' state.
 #include "storage/zav_raid_parse.h"
 
-#include "appliance.h"
+#include "texts.h"
 #include "zav_api.h"
 
 #include <benchmark/benchmark.h>
