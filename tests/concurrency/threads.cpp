@@ -1,0 +1,124 @@
+// Runs on the simulated appliance: eight threads ask the library, and change what may be changed,
+// all at once; then discs are burned and blanked while others ask for the progress and cancel. No
+// answer may be another than the one that a thread alone was given. Built with the thread sanitizer
+// it tells of races too. usage: threads SECONDS
+#include "questions.h"
+#include "zav_api.h"
+
+#include <atomic>
+#include <chrono>
+#include <cstdio>
+#include <cstdlib>
+#include <random>
+#include <thread>
+#include <unistd.h>
+
+namespace {
+
+using concurrency::Question;
+using Clock = std::chrono::steady_clock;
+
+constexpr unsigned kThreads = 8;
+
+std::atomic<bool> stop;
+std::atomic<long> asked;
+std::atomic<long> different;
+
+// Each begins with a question of its own.
+void ask_and_change(const std::vector<Question> &all, unsigned number) {
+    std::minstd_rand random(number + 1);
+    for (std::size_t i = number; !stop; i = random()) {
+        const Question &question = all[i % all.size()];
+        different += question.ask() != question.right;
+        ++asked;
+        concurrency::change(static_cast<unsigned>(random()));
+    }
+}
+
+void ask_together(std::chrono::seconds length) {
+    const std::vector<Question> all = concurrency::questions();
+    std::vector<std::thread> threads;
+    for (unsigned number = 0; number < kThreads; ++number)
+        threads.emplace_back(ask_and_change, std::cref(all), number);
+    std::this_thread::sleep_for(length);
+    stop = true;
+    for (std::thread &thread : threads)
+        thread.join();
+}
+
+struct Job {
+    const char *disc; // a sentence of the simulator
+    int (*run)();
+    int failure; // what it answers when it was cancelled
+};
+
+int burn_cd() {
+    return zavCDBurn(const_cast<char *>("/tmp/burn"), 0);
+}
+
+constexpr Job kJobs[] = {
+    {"blank DVD+R", burn_cd, ZAV_RC_ERR_BURNER},
+    {"blank CD-R", burn_cd, ZAV_RC_ERR_CDTOOL},
+    {"complete CD-RW", zavCDBlank, ZAV_RC_ERR_BLANK},
+};
+
+bool is_progress(int value) {
+    return value >= 0 && value <= 100;
+}
+
+struct Burns {
+    long finished = 0;
+    long cancelled = 0;
+    long progress = 0;
+    long wrong = 0;
+};
+
+// Another thread asks for the progress meanwhile, and cancels half way.
+void run_beside(const Job &job, bool cancel, Burns &burns) {
+    const std::string disc =
+        std::string("zavsim act drive loses its disc; zavsim act drive gets ") + job.disc +
+        "; zavsim act drive writes at 4000";
+    burns.wrong += std::system((disc + " >/dev/null 2>&1").c_str()) != 0;
+    std::atomic<bool> done = false;
+    std::thread observer([&] {
+        for (bool sent = false; !done; std::this_thread::sleep_for(std::chrono::milliseconds(5))) {
+            const int value = zavCDProgress();
+            burns.wrong += !is_progress(value);
+            ++burns.progress;
+            if (cancel && !sent && value >= 50)
+                sent = zavCDBurnCancel() == 0;
+        }
+    });
+    const int rc = job.run();
+    done = true;
+    observer.join();
+    burns.finished += rc == 0;
+    burns.cancelled += rc == job.failure;
+    burns.wrong += rc != 0 && (rc != job.failure || !cancel);
+}
+
+Burns burn_and_cancel(std::chrono::seconds length) {
+    const auto end = Clock::now() + length;
+    Burns burns;
+    std::system("mkdir -p /tmp/burn; head -c 40000000 /dev/zero > /tmp/burn/big");
+    for (unsigned i = 0; i < 2 * std::size(kJobs) || Clock::now() < end; ++i)
+        run_beside(kJobs[i % std::size(kJobs)], i % 2 != 0, burns);
+    return burns;
+}
+
+} // namespace
+
+int main(int argc, char **argv) {
+    const std::chrono::seconds length(argc > 1 ? std::atoi(argv[1]) : 20);
+    std::FILE *report = fdopen(dup(STDOUT_FILENO), "w"); // the rest of what is printed are traces
+    std::freopen("/dev/null", "w", stdout);
+    std::freopen("/dev/null", "w", stderr);
+    ask_together(length / 2);
+    std::fprintf(report, "%u threads: %ld answers, %ld of them different\n", kThreads, asked.load(),
+                 different.load());
+    const Burns burns = burn_and_cancel(length / 2);
+    std::fprintf(report,
+                 "beside the burner: %ld jobs finished, %ld cancelled; %ld progress; %ld wrong\n",
+                 burns.finished, burns.cancelled, burns.progress, burns.wrong);
+    return different == 0 && asked > 0 && burns.wrong == 0 && burns.finished > 0 ? 0 : 1;
+}
