@@ -45,8 +45,7 @@ void put_settings() {
     put("/etc/sysconfig/clock", "ZONE=\"Asia/Tokyo\"\n");
     put("/etc/arecaTimeZone.list", "Asia/Seoul\nAsia/Tokyo\n");
     put("/etc/Kiru/zav/DataVG1", backup_text(1, 0));
-    put("/etc/Kiru/zav/.raidinfo", report_text(0));
-    put("/var/log/apcupsd.status", ups_text);
+    put("/etc/Kiru/zav/.raidinfo", report_text(4));
     put("/tmp/progress.outfile", "0% done, estimate finish\n34% done, estimate finish\n");
 }
 
@@ -83,9 +82,8 @@ void put_sensors() {
 
 void put_devices() {
     for (const char *node :
-         {"/dev/sata/disk1", "/dev/swraid/disk2p1", "/dev/hwraid/disk1", "/dev/sasraid/r1disk1p1",
-          "/dev/iscsiraid/disk1", "/dev/DataVG1/LogVol1", "/dev/scd0", "/dev/cdrom",
-          "/dev/zavevent0", "/dev/zavledevent"})
+         {"/dev/sata/disk1", "/dev/swraid/disk2p1", "/dev/hwraid/disk1", "/dev/iscsiraid/disk1",
+          "/dev/DataVG1/LogVol1", "/dev/scd0", "/dev/cdrom", "/dev/zavevent0", "/dev/zavledevent"})
         put(node, "");
     put("/dev/sasraid/r1disk1", std::string(512, '\0'));
     put("/dev/mem", firmware_image());

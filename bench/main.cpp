@@ -1,6 +1,7 @@
 // zav_bench: what the library costs. Run it with bench/run.
 #include "appliance.h"
 #include "queries.h"
+#include "reads.h"
 
 #include <algorithm>
 #include <benchmark/benchmark.h>
@@ -29,6 +30,7 @@ int run(int argc, char **argv) {
     if (!bench::set_up_appliance())
         return 1;
     run_microbenchmarks(argc, argv);
+    bench::compare_reads();
     const bench::Verdict queries = bench::compare_queries();
     if (queries == bench::Verdict::kBroken)
         return 1;

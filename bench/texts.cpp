@@ -143,9 +143,9 @@ std::string backup_text(int physical, int logical, int segments) {
 }
 
 std::string report_text(int lines_before) {
-    return "PCI\nM:HBRC-R16\nS:Y001\nI:\nR:1:Raid Set # 00:2000.0:4:1234:0\nH:38:1:2:3\n" +
+    return "PCI\nM:HBRC-R16\nS:Y001\nI:\nR:1:Raid Set # 00:2000.0:4:1234:0\n" +
            repeated("D:1:500.1:1\n", lines_before) +
-           "RBOD#1\nM:HBQE-T500\nS:Y101\nI:\nR:1:Raid Set # 01:4000.0:4:1234:0\n"
+           "H:38:1:2:3\nRBOD#1\nM:HBQE-T500\nS:Y101\nI:\nR:1:Raid Set # 01:4000.0:4:1234:0\n"
            "V:1:UNIT1:3:3000.0:0:1\nD:1:1000.2:1\nD:2:1000.2:1\nD:3:1000.2:1\n"
            "D:4:1000.2:1\nH:45.0:3200:11.9:5.1:1.20\n";
 }

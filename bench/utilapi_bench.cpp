@@ -1,4 +1,4 @@
-// Names of codes, trimming.
+// Names of codes, trimming, conversion of codes, traces.
 #include "zav_api.h"
 
 #include <benchmark/benchmark.h>
@@ -44,5 +44,20 @@ char blanks[] = " \t\n";
 BENCHMARK_CAPTURE(trim_text, trim, [](char *text) { trim(text); });
 BENCHMARK_CAPTURE(trim_text, rtrim, [](char *text) { rtrim(text, blanks); });
 BENCHMARK_CAPTURE(trim_text, ltrim, [](char *text) { ltrim(text, blanks); });
+
+void convert_code(benchmark::State &state, int (*convert)(int)) {
+    for (auto _ : state)
+        if (convert(ZAV_RC_ERR_ESTRPIPE) != ZAV_RC_ERR_ESTRPIPE)
+            state.SkipWithError("another code");
+}
+BENCHMARK_CAPTURE(convert_code, zavRCSysToZav, zavRCSysToZav);
+BENCHMARK_CAPTURE(convert_code, zavRCZavToSys, zavRCZavToSys);
+
+// What each trace costs that is not printed.
+void stay_silent(benchmark::State &state) {
+    for (auto _ : state)
+        zavdbgmsg(2, 1, "%s() - %d\n", "query", 1);
+}
+BENCHMARK(stay_silent)->Name("zavdbgmsg, silent");
 
 } // namespace
