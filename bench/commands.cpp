@@ -11,6 +11,7 @@ namespace bench {
 namespace {
 
 std::vector<Command> *recorded = nullptr;
+std::string answer; // in place of running a command, unless empty
 
 void run_piped(const std::string &command) {
     FILE *output = popen(command.c_str(), "re");
@@ -30,6 +31,14 @@ std::vector<Command> commands_of(const Action &action) {
     action();
     recorded = nullptr;
     return commands;
+}
+
+Action answered(const std::string &text, const Action &action) {
+    return [text, action] {
+        answer = text;
+        action();
+        answer.clear();
+    };
 }
 
 void run_bare(const std::vector<Command> &commands) {
@@ -59,5 +68,7 @@ extern "C" FILE *popen(const char *command, const char *mode) {
     static const auto real = reinterpret_cast<Popen>(dlsym(RTLD_NEXT, "popen"));
     if (bench::recorded != nullptr)
         bench::recorded->push_back({command, true, 0});
+    if (!bench::answer.empty())
+        return fmemopen(bench::answer.data(), bench::answer.size(), "r");
     return real(command, mode);
 }

@@ -18,6 +18,9 @@ struct Command {
 // What the action has the shell run, in order.
 std::vector<Command> commands_of(const Action &action);
 
+// The action with that text in place of what every command prints that it reads from; none is run.
+Action answered(const std::string &text, const Action &action);
+
 // Runs them as a program without the library would. They must end as they did for the library.
 void run_bare(const std::vector<Command> &commands);
 
