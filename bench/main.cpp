@@ -1,5 +1,6 @@
 // zav_bench: what the library costs. Run it with bench/run.
 #include "appliance.h"
+#include "footprint.h"
 #include "growth.h"
 #include "queries.h"
 #include "reads.h"
@@ -31,9 +32,9 @@ int run(int argc, char **argv) {
     if (!bench::set_up_appliance())
         return 1;
     run_microbenchmarks(argc, argv);
+    bench::report_footprint();
     bench::compare_reads();
-    const bench::Verdict queries =
-        getenv("SKIPQ") ? bench::Verdict::kKept : bench::compare_queries();
+    const bench::Verdict queries = bench::compare_queries();
     const bool linear = bench::report_growth();
     if (queries == bench::Verdict::kBroken || !linear)
         return 1;
