@@ -39,8 +39,8 @@ void feed(std::string text, const Take &take) {
 // ---- Whole calls that read a file ----
 
 // Writes the file before the call is timed.
-std::function<Action(int)> of_file(const char *path, std::function<std::string(int)> text,
-                                   Action call) {
+std::function<Action(int)> of_file(const char *path, const std::function<std::string(int)> &text,
+                                   const Action &call) {
     return [=](int lines) {
         put(path, text(lines));
         return call;
