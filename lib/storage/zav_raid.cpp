@@ -191,7 +191,7 @@ int getRaidStateSW(zavDevice *dev, zavRaidState *info) {
     if (dev->part != 1)
         return ZAV_RC_ERR_EINVAL;
 
-    char path[80];
+    char path[80] = ""; // stays so for an address without a name
     zavDevToStr(path, sizeof path, dev);
     ZAV_TRACE(zav::kTraceStep, "%s() - device path from zavDevToStr is:  %s\n", __func__, path);
     int rc = ZAV_RC_OK;

@@ -365,6 +365,15 @@ TEST_F(Array, ThePartitionIsOne) {
     EXPECT_TRUE(record().log.empty());
 }
 
+TEST_F(Array, ReaderFindsNoNodeForAnAddressWithoutAName) {
+    zavDevice dev = {0, ZAV_MINDEV_RAID_SW, 2, 1};
+    EXPECT_EQ(checked([&] { return getRaidStateSW(&dev, &info); }), ZAV_RC_OK);
+    EXPECT_EQ(info.state, ZAV_RAID_NOT_EXIST);
+    EXPECT_EQ(record().log, std::vector{row("getRaidStateSW", 4,
+                                            "[19] md  not found[1]. ErrCode[0x2] No such file or "
+                                            "directory")});
+}
+
 TEST_F(Array, ArgumentsMustNotBeNull) {
     zavDevice dev = kArray2;
     EXPECT_EQ(zavGetStateRaid(nullptr, &info), ZAV_RC_ERR_EINVAL);
@@ -450,6 +459,13 @@ TEST_F(IscsiTarget, ReadersTakeNoNullPointers) {
         EXPECT_EQ(reader(nullptr, &info), ZAV_RC_ERR_EINVAL);
         EXPECT_EQ(reader(&dev, nullptr), ZAV_RC_ERR_EINVAL);
     }
+}
+
+TEST_F(IscsiTarget, ReaderNeedsAnAddressThatHasAName) {
+    zavDevice dev = {0, ZAV_MINDEV_RAID_ISCSI, 7, 0};
+    EXPECT_EQ(checked([&] { return getRaidStateISCSI(&dev, &info); }), ZAV_RC_ERR_EINVAL);
+    EXPECT_TRUE(record().sleeps.empty());
+    EXPECT_TRUE(record().log.empty());
 }
 
 TEST_F(IscsiTarget, ThatIsMissingDoesNotExistAfterTwoGraceWaits) {
