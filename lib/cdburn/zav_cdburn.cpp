@@ -8,9 +8,11 @@
 #include "zav_cdburn_choice.h"
 #include "zav_cdburn_media.h"
 
+#include <algorithm>
 #include <cstdio>
 #include <cstring>
 #include <dirent.h>
+#include <iterator>
 #include <unistd.h>
 
 namespace {
@@ -50,11 +52,11 @@ constexpr const char *kCdNextSession =
     "mkisofs -C %s -M /dev/scd0 -R -J -f %s 2>/tmp/progress.outfile | cdrecord dev=/dev/scd0 "
     "-multi -v -gracetime=3 -data - &>/dev/null";
 
+// Every recipe for a DVD has its row.
 const char *dvd_form(Recipe recipe) {
-    for (const DvdRecipe &row : kDvdRecipes)
-        if (row.recipe == recipe)
-            return row.form;
-    return nullptr;
+    return std::find_if(std::begin(kDvdRecipes), std::end(kDvdRecipes),
+                        [recipe](const DvdRecipe &row) { return row.recipe == recipe; })
+        ->form;
 }
 
 // The command for a disc that is not refused. `word` is what prepare() found.

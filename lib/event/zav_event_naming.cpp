@@ -222,9 +222,9 @@ bool parse_rest(const Kind &kind, const char *rest, zavDevice &dev) {
     case Form::kSystemGroup:
         return parse_system_group(rest, dev);
     case Form::kInterface:
-        return parse_interface(rest, dev);
+        break;
     }
-    return false;
+    return parse_interface(rest, dev);
 }
 
 } // namespace
