@@ -161,19 +161,9 @@ int scandir(const char *path, dirent ***names, int (*chosen)(const dirent *),
     return count;
 }
 
-int access(const char *path, int mode) noexcept {
-    REAL(access);
-    return fails("access", CALLER) ? failed(EACCES, -1) : the_real(path, mode);
-}
-
 int stat(const char *path, struct stat *status) noexcept {
     static const auto the_real = real<int(const char *, struct stat *)>("stat");
     return fails("stat", CALLER) ? failed(EACCES, -1) : the_real(path, status);
-}
-
-int fstat(int descriptor, struct stat *status) noexcept {
-    static const auto the_real = real<int(int, struct stat *)>("fstat");
-    return fails("fstat", CALLER) ? failed(EIO, -1) : the_real(descriptor, status);
 }
 
 int unlink(const char *path) noexcept {

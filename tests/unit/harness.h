@@ -86,6 +86,9 @@ struct Record {
     bool calloc_fails = false;
     bool fprintf_fails = false;
     bool munmap_fails = false;
+    bool close_fails = false;
+    std::optional<int> access_error; // with which access() fails
+    bool files_are_devices = false;  // to fstat(): of no size
 };
 
 Record &record();

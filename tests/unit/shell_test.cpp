@@ -65,6 +65,16 @@ TEST_F(ShellCommand, IsNeverRunWithAWordThatWouldBeAnOption) {
     EXPECT_STREQ(command.text(), "rm -f /scratch/there");
 }
 
+TEST_F(ShellCommand, IsNeverRunWithAnOptionForItsName) {
+    EXPECT_EQ(Command("%s /scratch", {"-c"}).run(), -1);
+    EXPECT_TRUE(record().commands.empty());
+}
+
+TEST_F(ShellCommand, KeepsPlacesForWhichItHasNoWord) {
+    EXPECT_STREQ(Command("date +%s", {}).text(), "date +%s");
+    EXPECT_STREQ(Command("%s +%s", {"date"}).text(), "date +%s");
+}
+
 TEST_F(ShellCommand, IsNeverRunCutOff) {
     const std::string longest(Command::kSize - 6, 'x');
     EXPECT_EQ(Command("true %s", {longest.c_str()}).run(), 0);
@@ -83,6 +93,15 @@ TEST_F(ShellCommand, GivesTheBeginningOfItsOutputAsAText) {
     char text[4] = "zzz";
     EXPECT_EQ(output.text(text, sizeof text), 3U);
     EXPECT_STREQ(text, "abc");
+}
+
+TEST_F(ShellCommand, ThatCouldNotBeStartedMayBeClosedInEitherWay) {
+    record().popen_fails = true;
+    CommandOutput output("true");
+    output.close();
+    output.close_plain();
+    EXPECT_FALSE(output);
+    EXPECT_EQ(record().pcloses, 0);
 }
 
 } // namespace

@@ -372,6 +372,13 @@ TEST_F(PhysicalMemory, AFailedUnmappingIsToldAndHarmless) {
     EXPECT_EQ(testing::internal::GetCapturedStdout(), "munmap error");
 }
 
+TEST_F(PhysicalMemory, ThatIsADeviceEndsNowhere) {
+    put("/dev/mem", memory(0));
+    record().files_are_devices = true; // whose size is told as 0
+    EXPECT_EQ(entry(2), "BOARD-SERIAL-NUMBER-");
+    EXPECT_EQ(entry(1), "SV-2860");
+}
+
 TEST_F(PhysicalMemory, AnImageThatEndsBeforeTheTableIsNotTouchedBehindItsEnd) {
     std::string bytes = memory(0);
     bytes[0xF0000 + 16 + 10] = '\x7F'; // the table's address is now far behind the end

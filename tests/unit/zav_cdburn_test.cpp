@@ -271,6 +271,18 @@ TEST_F(Burning, NeedsTheSessionsOfACd) {
     EXPECT_EQ(record().steps.back(), kMsinfo);
 }
 
+TEST_F(Burning, NeedsASessionReportThatIsNotEmpty) {
+    cd(1, std::string(kCdR) + "0,11702\n");
+    int asked = 0;
+    record().before_command = [&asked](const std::string &command) {
+        if (command == kMsinfo && ++asked == 2)
+            put("/tmp/cd.outfile", "");
+    };
+    EXPECT_EQ(burn("/scratch/tree", 1), ZAV_RC_ERR_CDTOOL);
+    EXPECT_EQ(asked, 2);
+    EXPECT_EQ(record().steps.back(), kMsinfo);
+}
+
 TEST_F(Burning, CleansUpWithoutACdsReport) {
     cd(0, kCdR);
     const auto answer = record().drive;

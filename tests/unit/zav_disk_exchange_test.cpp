@@ -360,6 +360,12 @@ TEST_F(DiskAddition, WithoutLinkIsRefused) {
               std::vector{row("zavDiskHotAdd", 4, "[0] no popen result [" + links("sdb") + "]")});
 }
 
+TEST_F(DiskAddition, FromADiskWithoutANameIsRefused) {
+    record().shell->first(links("sdb"), prints("/dev/sas/r8388608disk1\n")); // a negative number
+    expect_no_source(2);
+    EXPECT_TRUE(record().log.empty());
+}
+
 TEST_F(DiskAddition, DropsTheLastCharacterOfTheMember) {
     record().shell->first(kFirstMember, prints(" /dev/sdaa12 \n"));
     expect_no_source(2);

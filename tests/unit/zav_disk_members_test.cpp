@@ -452,6 +452,13 @@ TEST_F(TearDown, AtABusyVolumeLeavesTheOthers) {
     EXPECT_EQ(changes(), join({{volume1[0], volume1[1]}, group, end, next}));
 }
 
+TEST_F(TearDown, AtAVolumeWithoutAPathLeavesTheOthers) {
+    put("/etc/Kiru/zav/DataVG1", "physical_volumes {\npv0 {\n}\n}\nlogical_volumes {\n"
+                                 "LogVol-1 {\n}\nLogVol2 {\n}\n}\n");
+    EXPECT_EQ(remove_members(), ZAV_RC_OK);
+    EXPECT_EQ(changes(), join({{"/bin/umount /mnt/internal/data1--1 2>&1"}, group, end, next}));
+}
+
 TEST_F(TearDown, WithoutPipeForTheNameStopsWithItsCode) {
     int asked = 0;
     record().during_short_sleep = [&] {
@@ -763,6 +770,16 @@ TEST_F(MemberAddition, CreatesNothingWhileADiskIsMissing) {
         EXPECT_EQ(add_members(), ZAV_RC_OK);
         EXPECT_EQ(changes(), (Steps{scan(1), scan(2)}));
     }
+}
+
+TEST_F(MemberAddition, CreatesNothingOnAOneDiskModel) {
+    model("SV-2740\n", "raidtype=0;0;1\n");
+    record().shell->first(scan(1), prints("nothing\n"));
+    record().shell->first(scan(2), array("/dev/md/MD1", "raid0"));
+    record().shell->first("/proc/scsi/scsi", prints("1\n"));
+    put("/proc/mdstat", "unused devices: <none>\n");
+    EXPECT_EQ(add_members(), ZAV_RC_OK);
+    EXPECT_EQ(changes(), (Steps{scan(1), scan(2)}));
 }
 
 TEST_F(MemberAddition, WithoutPipeForTheCreationStopsWith32) {

@@ -1,6 +1,7 @@
 // Is a disk present and healthy?
 #include "harness.h"
 
+#include <cerrno>
 #include <climits>
 
 namespace {
@@ -142,6 +143,17 @@ TEST_F(Disk, WhoseNodeIsInaccessibleIsAnError) {
     EXPECT_EQ(record().log, expected);
 }
 
+TEST_F(Disk, WhoseNodeHasNoDeviceIsMissing) {
+    insert(3);
+    record().access_error = ENODEV;
+    EXPECT_EQ(ask(kDisk3), ZAV_RC_OK);
+    expect_filled(kDisk3, ZAV_HDD_ABSENT);
+    EXPECT_EQ(record().log,
+              std::vector{row("getDiskStateSATA", 4,
+                              "[19] Device /dev/sata/disk3 not found[1]. ErrCode[0x13] No such "
+                              "device")});
+}
+
 TEST_F(Disk, TheLastAttemptDecidesWhetherTheNodeIsMissing) {
     remove("/dev/sata");
     put("/dev/sata", "");
@@ -178,6 +190,15 @@ TEST_F(Disk, ReaderAnswersByItself) {
     zavDevice dev = kDisk3;
     EXPECT_EQ(checked([&] { return getDiskStateSATA(&dev, &info); }), ZAV_RC_OK);
     EXPECT_EQ(info.state, ZAV_HDD_FOUND);
+}
+
+TEST_F(Disk, ReaderNeedsAnAddressThatHasAName) {
+    zavDevice dev = {0, ZAV_MINDEV_HDD_SATA, 3, 0};
+    info.state = 9;
+    EXPECT_EQ(checked([&] { return getDiskStateSATA(&dev, &info); }), ZAV_RC_ERR_EINVAL);
+    EXPECT_EQ(info.state, 9);
+    EXPECT_TRUE(record().sleeps.empty());
+    EXPECT_TRUE(record().commands.empty());
 }
 
 TEST_F(Disk, OtherDeviceTypesAreRefused) {

@@ -127,6 +127,19 @@ TEST_F(ChassisMark, OfAFullVolumeCannotBeWritten) {
     EXPECT_EQ(record().log, std::vector{row("zavSetiRBOD", 1, "[28] write is failed!")});
 }
 
+TEST_F(ChassisMark, OfAVolumeThatFailsInTheEndIsLogged) {
+    volume("");
+    record().close_fails = true;
+    const int written = zavSetiRBOD(&unit);
+    const int asked = zavGetiRBOD(&unit, &state);
+    record().close_fails = false;
+    EXPECT_EQ(written, 5);
+    EXPECT_EQ(asked, 5);
+    EXPECT_EQ(state, -1);
+    EXPECT_EQ(record().log, (std::vector{row("zavSetiRBOD", 1, "[5] close is failed!"),
+                                         row("zavGetiRBOD", 1, "[5] close is failed!")}));
+}
+
 TEST_F(ChassisMark, NeedsItsArguments) {
     EXPECT_EQ(zavMapRBODCCV(nullptr), ZAV_RC_ERR_EINVAL);
     EXPECT_EQ(zavSetiRBOD(nullptr), ZAV_RC_ERR_EINVAL);

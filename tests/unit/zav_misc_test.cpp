@@ -102,6 +102,13 @@ TEST_F(Model, TakesARaidtypeFileThatComesLate) {
     EXPECT_EQ(record().short_sleeps, std::vector{100U});
 }
 
+TEST_F(Model, OfARaidtypeFileThatComesLateAndEmptyHasNoDisks) {
+    put("/sys/class/dmi/id/product_name", "SV-2860\n");
+    record().during_short_sleep = [] { put("/etc/Kiru/raidtype", ""); };
+    EXPECT_EQ(zavGetModel(), 0x200);
+    EXPECT_EQ(record().short_sleeps, std::vector{100U});
+}
+
 TEST_F(Model, ConfigurationByModel) {
     const struct {
         const char *product;
