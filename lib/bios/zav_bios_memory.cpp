@@ -27,15 +27,44 @@ struct Free {
 };
 using Buffer = std::unique_ptr<char, Free>;
 
+// The firmware's memory by paragraphs, from the current position on. It is read by pages: a call of
+// the kernel for each paragraph is what takes most of the search.
+class Paragraphs {
+  public:
+    explicit Paragraphs(int memory) : memory_(memory) {}
+
+    // The next one, or null behind the last that is whole.
+    const char *next() {
+        if (at_ == length_) {
+            const ssize_t count = read(memory_, page_, sizeof page_);
+            length_ = count < 0 ? 0 : static_cast<size_t>(count);
+            at_ = 0;
+        }
+        if (length_ - at_ < kParagraph)
+            return nullptr;
+        const char *paragraph = page_ + at_;
+        at_ += kParagraph;
+        return paragraph;
+    }
+
+  private:
+    int memory_;
+    char page_[4096] = {};
+    size_t length_ = 0;
+    size_t at_ = 0;
+};
+
 // Finds the table's place in the firmware's memory, from the current position on.
 bool find_table(int memory, SmbiosTable &table) {
-    char paragraph[kParagraph];
-    const auto next = [&] { return read(memory, paragraph, kParagraph) == kParagraph; };
-    for (long at = kFirmwareStart; at < kFirmwareEnd && next(); at += kParagraph) {
+    Paragraphs paragraphs(memory);
+    const char *paragraph;
+    for (long at = kFirmwareStart; at < kFirmwareEnd && (paragraph = paragraphs.next()) != nullptr;
+         at += kParagraph) {
         if (!zav::begins_entry_point(paragraph))
             continue;
         at += kParagraph;
-        if (next() && zav::locates_table(paragraph, table))
+        paragraph = paragraphs.next();
+        if (paragraph != nullptr && zav::locates_table(paragraph, table))
             return true;
     }
     return false;
