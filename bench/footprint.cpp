@@ -6,6 +6,7 @@
 
 #include <cstdio>
 #include <filesystem>
+#include <sstream>
 #include <string>
 #include <sys/wait.h>
 #include <unistd.h>
@@ -39,11 +40,9 @@ struct Sections {
 };
 
 Sections sections_of(const std::string &library) {
-    const std::string table = output_of("size " + library + " | tail -n 1");
+    std::istringstream row(output_of("size " + library + " | tail -n 1"));
     Sections sections = {};
-    require(sscanf(table.c_str(), "%ld %ld %ld", &sections.text, &sections.data, &sections.bss) ==
-                3,
-            "size");
+    require(static_cast<bool>(row >> sections.text >> sections.data >> sections.bss), "size");
     return sections;
 }
 
@@ -100,9 +99,10 @@ std::string run_probe(const Process &process) {
 void measure(Process &process) {
     std::string told;
     process.whole.push_back(microseconds([&] { told = run_probe(process); }));
+    std::istringstream numbers(told);
     double loading = 0;
     double peak = 0;
-    require(sscanf(told.c_str(), "%lf %lf", &loading, &peak) == 2, process.name);
+    require(static_cast<bool>(numbers >> loading >> peak), process.name);
     process.loading.push_back(loading);
     process.peak.push_back(peak);
 }

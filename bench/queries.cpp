@@ -210,9 +210,9 @@ Verdict verdict_of(const Comparison &row) {
     return not_known(row) ? Verdict::kNotKnown : Verdict::kBroken;
 }
 
-// The same appliance for both, the process too: a fork costs what the process is large.
-Comparison compare(const Query &query, const std::vector<Command> &commands) {
-    Pairs pairs([&] { run_bare(commands); }, query.call);
+// The same process for both: what starting a command costs depends on who starts it.
+Comparison compare(const std::vector<Command> &commands, const Action &call) {
+    Pairs pairs([&] { run_bare(commands); }, call);
     pairs.measure(kWarmUp);
     const std::size_t first = pairs.fitting(kSeconds, kLeastPairs, kMostPairs);
     const std::size_t more = pairs.fitting(kMoreSeconds, kLeastPairs, 4 * kMostPairs);
@@ -224,14 +224,27 @@ Comparison compare(const Query &query, const std::vector<Command> &commands) {
     return pairs.compared();
 }
 
-Verdict print(const Query &query, std::size_t commands, const Comparison &row) {
+Verdict print(const char *name, std::size_t commands, const Comparison &row) {
     static constexpr const char *kWords[] = {"OK", "NOT KNOWN", "OVER"};
     const Verdict verdict = verdict_of(row);
-    printf("%-34s %8zu %6zu %10.1f %10.1f %7.3f  %.3f .. %.3f  %s\n", query.name, commands,
-           row.pairs, row.bare, row.call, row.ratio, row.low, row.high,
-           kWords[static_cast<int>(verdict)]);
+    printf("%-34s %8zu %6zu %10.1f %10.1f %7.3f  %.3f .. %.3f  %s\n", name, commands, row.pairs,
+           row.bare, row.call, row.ratio, row.low, row.high, kWords[static_cast<int>(verdict)]);
     fflush(stdout);
     return verdict;
+}
+
+// What the machine makes of two that are the same.
+void print_noise() {
+    const std::vector<Command> commands = commands_of(ask_disk);
+    print("(one bare command beside itself)", commands.size(),
+          compare(commands, [&] { run_bare(commands); }));
+}
+
+Verdict measure(const Query &query) {
+    query.prepare();
+    const std::vector<Command> commands = commands_of(query.call);
+    require(!commands.empty(), query.name);
+    return print(query.name, commands.size(), compare(commands, query.call));
 }
 
 } // namespace
@@ -241,12 +254,9 @@ Verdict compare_queries() {
            "%.2f)\n%-34s %8s %6s %10s %10s %7s  %s\n",
            kLimit, "query", "commands", "pairs", "bare us", "call us", "ratio", "95 % interval");
     Verdict worst = Verdict::kKept;
-    for (const Query &query : kQueries) {
-        query.prepare();
-        const std::vector<Command> commands = commands_of(query.call);
-        require(!commands.empty(), query.name);
-        worst = std::max(worst, print(query, commands.size(), compare(query, commands)));
-    }
+    print_noise();
+    for (const Query &query : kQueries)
+        worst = std::max(worst, measure(query));
     if (worst == Verdict::kNotKnown)
         puts("NOT KNOWN: the limit lies within the interval; measure again on a quieter machine.");
     return worst;
