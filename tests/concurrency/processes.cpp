@@ -62,7 +62,7 @@ bool all_end(std::vector<pid_t> &processes) {
     for (const pid_t process : processes) {
         int status = 0;
         while (waitpid(process, &status, WNOHANG) == 0 && Clock::now() < last)
-            std::this_thread::sleep_for(std::chrono::milliseconds(20));
+            std::this_thread::sleep_for(std::chrono::milliseconds(200));
         if (kill(process, SIGKILL) == 0) {
             ended = false;
             waitpid(process, &status, 0);
@@ -97,7 +97,8 @@ int main(int argc, char **argv) {
         processes.push_back(begin(*shared, all, static_cast<unsigned>(random())));
     long killed = 0;
     for (const auto end = Clock::now() + seconds(length); Clock::now() < end; ++killed) {
-        std::this_thread::sleep_for(std::chrono::milliseconds(50 + random() % 450));
+        // Of the appliance, which are shorter.
+        std::this_thread::sleep_for(std::chrono::milliseconds(500 + random() % 4500));
         pid_t &victim = processes[random() % processes.size()];
         kill(victim, SIGKILL);
         waitpid(victim, nullptr, 0);
