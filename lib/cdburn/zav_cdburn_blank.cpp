@@ -87,8 +87,16 @@ int blank(const zavMediaInfo &disc) {
         return empty_dvd();
     case ZAV_DISC_NONE:
         return ZAV_RC_ERR_NODISC;
-    default: // written once, read only, or not known
+    case ZAV_DVD_ROM:
+    case ZAV_DVD_MINUS_R_SEQ:
+    case ZAV_DVD_RAM:
+    case ZAV_DVD_PLUS_R:
+    case ZAV_DVD_PLUS_R_DOUBLE:
+    case ZAV_CD_R:
+    case ZAV_DISC_UNKNOWN:
         return ZAV_RC_ERR_BADDISC;
+    default:
+        return ZAV_RC_ERR_EINVAL;
     }
 }
 
