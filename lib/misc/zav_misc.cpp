@@ -104,6 +104,8 @@ int zavGetModelConfig(int *model, int *diskmax, int *diskcount) {
     if (model == nullptr || diskmax == nullptr || diskcount == nullptr)
         return ZAV_RC_ERR;
     *model = zavGetModel();
+    if (*model == ZAV_MODEL_SOLVANE_NONE)
+        return 0x1301;
     for (const auto &config : kConfigs) {
         if (config.model == *model) {
             *diskmax = config.slots;
@@ -111,7 +113,7 @@ int zavGetModelConfig(int *model, int *diskmax, int *diskcount) {
             return ZAV_RC_OK;
         }
     }
-    return 0x1301; // no model
+    return ZAV_RC_ERR;
 }
 
 int zavGetDataRaidtype(void) {
