@@ -17,12 +17,18 @@ double microseconds(const Action &action);
 
 double median(std::vector<double> values);
 
+// Of call / bare over the pairs, with its 95 % confidence interval.
+struct Ratio {
+    double median;
+    double low;
+    double high;
+};
+
 struct Comparison {
     double bare; // microseconds, median
     double call;
-    double ratio; // median of call / bare over the pairs
-    double low;   // the ratio's 95 % confidence interval
-    double high;
+    Ratio time;
+    Ratio processor; // of the processor time, children included: others' load does not count
     std::size_t pairs;
 };
 
@@ -44,13 +50,19 @@ class Pairs {
     void forget();
 
   private:
-    double time(const Action &action) const;
+    // Microseconds per call, a row for each sample.
+    struct Times {
+        std::vector<double> real;
+        std::vector<double> processor;
+    };
+
+    void sample(const Action &action, Times &times) const;
 
     Action bare_;
     Action call_;
     std::size_t calls_;
-    std::vector<double> bare_times_;
-    std::vector<double> call_times_;
+    Times bare_times_;
+    Times call_times_;
 };
 
 } // namespace bench
