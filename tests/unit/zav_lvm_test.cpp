@@ -451,7 +451,7 @@ TEST_F(PhysicalVolume, OnADeviceWithoutAPathIsTold) {
     record().shell->first(kLink, prints("/dev/sas/r8388608disk1\n")); // a negative number
     EXPECT_EQ(ask(), ZAV_RC_ERR_EINVAL);
     EXPECT_EQ(info.state, ZAV_LVM_NORMAL);
-    EXPECT_EQ(record().log.back(), row("zavgetStateLVMPV", 4, "[1] zavDevToStr() failed."));
+    EXPECT_EQ(record().log, std::vector{row("zavgetStateLVMPV", 4, "[1] zavDevToStr() failed.")});
     EXPECT_EQ(record().commands.back().find("/usr/sbin/pvs"), std::string::npos);
 }
 
