@@ -9,13 +9,12 @@
 #include <benchmark/benchmark.h>
 #include <cstdio>
 #include <exception>
-#include <stdexcept>
 #include <vector>
 
 namespace {
 
-// Short, as there are many; the command line may say otherwise.
-void run_microbenchmarks(int argc, char **argv) {
+// Short, as there are many; the command line may say otherwise. False for an option there is not.
+bool run_microbenchmarks(int argc, char **argv) {
     char least[] = "--benchmark_min_time=0.05";
     std::vector<char *> words(argv, argv + argc);
     words.insert(words.begin() + std::min(argc, 1), least);
@@ -23,15 +22,17 @@ void run_microbenchmarks(int argc, char **argv) {
     int count = argc + 1;
     benchmark::Initialize(&count, words.data());
     if (benchmark::ReportUnrecognizedArguments(count, words.data()))
-        throw std::runtime_error("no such option");
+        return false;
     benchmark::RunSpecifiedBenchmarks();
     fflush(stdout);
+    return true;
 }
 
 int run(int argc, char **argv) {
     if (!bench::set_up_appliance())
         return 1;
-    run_microbenchmarks(argc, argv);
+    if (!run_microbenchmarks(argc, argv))
+        return 64;
     bench::report_footprint();
     bench::compare_reads();
     const bench::Verdict queries = bench::compare_queries();
