@@ -70,10 +70,12 @@ bool find_table(int memory, SmbiosTable &table) {
     return false;
 }
 
-// An image file that ends early must not be touched behind its end.
-bool ends_before(int memory, const SmbiosTable &table) {
+// An image file that ends early must not be touched behind its end, nor one that may.
+bool may_end_before(int memory, const SmbiosTable &table) {
     struct stat status;
-    return fstat(memory, &status) == 0 && S_ISREG(status.st_mode) &&
+    if (fstat(memory, &status) != 0)
+        return true;
+    return S_ISREG(status.st_mode) &&
            status.st_size < static_cast<long long>(table.address) + table.length;
 }
 
@@ -87,9 +89,10 @@ Buffer copy_table(int memory, const SmbiosTable &table) {
     const uint32_t offset = table.address % page;
     const size_t size = size_t{offset} + table.length;
     // The table may lie above 2 GiB, which a 32-bit file offset does not reach.
-    void *map = ends_before(memory, table) ? MAP_FAILED
-                                           : mmap64(nullptr, size, PROT_READ, MAP_SHARED, memory,
-                                                    static_cast<off64_t>(table.address) - offset);
+    void *map = may_end_before(memory, table)
+                    ? MAP_FAILED
+                    : mmap64(nullptr, size, PROT_READ, MAP_SHARED, memory,
+                             static_cast<off64_t>(table.address) - offset);
     if (map == MAP_FAILED) {
         printf("mmap error");
         return nullptr;

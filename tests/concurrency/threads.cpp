@@ -9,6 +9,8 @@
 #include <chrono>
 #include <cstdio>
 #include <cstdlib>
+#include <iterator>
+#include <string>
 #include <thread>
 #include <unistd.h>
 
@@ -23,15 +25,25 @@ std::atomic<bool> stop;
 
 struct Told {
     long answers = 0;
-    long different = 0;
+    std::vector<std::string> different; // each with what it was
 };
+
+std::string difference(const Question &question, const std::string &answer) {
+    std::string text = question.name;
+    for (std::size_t i = 0; i < answer.size() && i < question.right.size(); ++i)
+        if (answer[i] != question.right[i])
+            text += " [" + std::to_string(i) + "] " + std::to_string(question.right[i]) + " > " +
+                    std::to_string(answer[i]);
+    return text;
+}
 
 // At least every question once, from another one on than the other threads. Nothing is shared with
 // these that would bring their accesses into an order, and so hide a race from the sanitizer.
 void ask_and_change(const std::vector<Question> &all, unsigned number, Told &told) {
     for (std::size_t i = number; i < number + all.size() || !stop; ++i) {
         const Question &question = all[i % all.size()];
-        told.different += question.ask() != question.right;
+        if (const std::string answer = question.ask(); answer != question.right)
+            told.different.push_back(difference(question, answer));
         ++told.answers;
         concurrency::change(static_cast<unsigned>(i));
     }
@@ -51,7 +63,8 @@ Told ask_together(std::chrono::seconds length) {
     for (unsigned number = 0; number < kThreads; ++number) {
         threads[number].join();
         sum.answers += told[number].answers;
-        sum.different += told[number].different;
+        std::move(told[number].different.begin(), told[number].different.end(),
+                  std::back_inserter(sum.different));
     }
     return sum;
 }
@@ -124,11 +137,13 @@ int main(int argc, char **argv) {
     std::freopen("/dev/null", "w", stdout);
     std::freopen("/dev/null", "w", stderr);
     const Told told = ask_together(length / 2);
-    std::fprintf(report, "%u threads: %ld answers, %ld of them different\n", kThreads, told.answers,
-                 told.different);
+    std::fprintf(report, "%u threads: %ld answers, %zu of them different\n", kThreads, told.answers,
+                 told.different.size());
+    for (const std::string &different : told.different)
+        std::fprintf(report, "  %s\n", different.c_str());
     const Burns burns = burn_and_cancel(length / 2);
     std::fprintf(report,
                  "beside the burner: %ld jobs finished, %ld cancelled; %ld progress; %ld wrong\n",
                  burns.finished, burns.cancelled, burns.progress, burns.wrong);
-    return told.different == 0 && burns.wrong == 0 && burns.finished > 0 ? 0 : 1;
+    return told.different.empty() && burns.wrong == 0 && burns.finished > 0 ? 0 : 1;
 }
