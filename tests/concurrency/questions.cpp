@@ -111,8 +111,9 @@ void change(unsigned number) {
     case 3:
         zavPollEvent(&event);
         break;
-    default:
-        zavResetThermal(1);
+    default: // not of the sensor that is asked for: its file is empty for a moment, unlike a
+             // kernel's
+        zavResetThermal(2);
     }
 }
 
