@@ -40,7 +40,7 @@ struct Sections {
 };
 
 Sections sections_of(const std::string &library) {
-    std::istringstream row(output_of("size " + library + " | tail -n 1"));
+    std::istringstream row(output_of("size '" + library + "' | tail -n 1"));
     Sections sections = {};
     require(static_cast<bool>(row >> sections.text >> sections.data >> sections.bss), "size");
     return sections;
@@ -48,7 +48,7 @@ Sections sections_of(const std::string &library) {
 
 void print_size(const std::string &library) {
     const std::string stripped = "/run/zav_bench_stripped";
-    output_of("strip -o " + stripped + " " + library);
+    output_of("strip -o " + stripped + " '" + library + "'");
     const Sections sections = sections_of(library);
     printf(
         "\nlibzav.so.1: %ju bytes as built, %ju without symbols and debug information; text %ld, "
@@ -62,7 +62,7 @@ void print_size(const std::string &library) {
 // What they do, and what was measured of all of them.
 struct Process {
     const char *name;
-    std::string library;
+    std::string loads;
     std::string query;
     std::vector<double> loading; // microseconds of dlopen
     std::vector<double> whole;   // from before its start to its end
@@ -72,7 +72,7 @@ struct Process {
 void exec_probe(const Process &process, int output) {
     const std::string probe = build_directory() + "/zav_bench_probe";
     dup2(output, STDOUT_FILENO);
-    const char *library = process.library.empty() ? nullptr : process.library.c_str();
+    const char *library = process.loads.empty() ? nullptr : process.loads.c_str();
     const char *query = process.query.empty() ? nullptr : process.query.c_str();
     execl(probe.c_str(), probe.c_str(), library, query, nullptr);
     _exit(127);
