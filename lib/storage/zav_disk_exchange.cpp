@@ -100,7 +100,8 @@ int check_source(Workspace &work) {
     zavDevice partition = work.source;
     for (partition.part = 1; partition.part <= kLastPartition; ++partition.part) {
         char name[128];
-        zavDevToStr(name, sizeof name, &partition);
+        if (const int rc = zavDevToStr(name, sizeof name, &partition); rc != ZAV_RC_OK)
+            return rc;
         if (!zav::node_opens(name))
             continue;
         const Command query("/sbin/mdadm --misc --query %s 2>&1", {name});
@@ -206,7 +207,7 @@ void run_step(const Command &command) {
 }
 
 // Whether the commands succeed is left to the arrays to find out.
-void prepare(const Workspace &work) {
+int prepare(Workspace &work) {
     const char *source = work.source_name;
     const char *target = work.target_name;
     run_step(Command("mdadm --zero-superblock %s &>/dev/null", {target}));
@@ -214,8 +215,11 @@ void prepare(const Workspace &work) {
     sleep(1);
     run_step(Command("/sbin/sfdisk -d %s | sfdisk %s &>/dev/null", {source, target}));
     sleep(5);
-    run_step(
-        Command("echo -ne \"\\x4D\\x10\" | dd of=%s bs=1 seek=440 count=2 &>/dev/null", {target}));
+    if (const int rc = zavDevToStr(work.text, sizeof work.text, &work.target); rc != ZAV_RC_OK)
+        return rc;
+    run_step(Command("echo -ne \"\\x4D\\x10\" | dd of=%s bs=1 seek=440 count=2 &>/dev/null",
+                     {work.text}));
+    return ZAV_RC_OK;
 }
 
 int add_disk(Workspace &work) {
@@ -239,7 +243,8 @@ int add_disk(Workspace &work) {
             return rc;
         sleep(10);
     }
-    prepare(work);
+    if (const int rc = prepare(work); rc != ZAV_RC_OK)
+        return rc;
     return zavAddSWRaidDev(&work.source, &work.target);
 }
 

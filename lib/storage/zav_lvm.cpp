@@ -254,7 +254,8 @@ int zavgetFSusage(zavDevice *dev, float *usage) {
     if (dev == nullptr || usage == nullptr)
         return ZAV_RC_ERR_EINVAL;
     char path[48];
-    zavDevToMnt(dev, path);
+    if (const int rc = zavDevToMnt(dev, path); rc != ZAV_RC_OK)
+        return rc;
     Command("ls -la %s &> /dev/null", {path}).run(); // wakes what is mounted on demand
     struct statfs system = {};
     if (const int rc = statfs(path, &system); rc != 0) {
