@@ -105,7 +105,8 @@ TEST(RunVolume, ADeviceWithoutAnAddressCannotBeTold) {
 }
 
 TEST(RunVolume, ManyAtOnceDoNotDisturbEachOther) {
-    const Outcome run = on_zav("for i in {1..6}; do { zavctl status >/dev/null; echo $?; } & done; "
-                               "wait");
+    const Outcome run =
+        on_zav("for i in {1..6}; do { zavctl status --timeout 600 >/dev/null; echo $?; } & done; "
+               "wait");
     EXPECT_EQ(run.out, "0\n0\n0\n0\n0\n0\n");
 }
