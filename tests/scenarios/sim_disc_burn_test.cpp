@@ -121,7 +121,7 @@ TEST(BurningProgress, IsSeenWhileItBurns) {
 }
 
 TEST(BurningProgress, HasItsToolsInTheProcessTable) {
-    EXPECT_EQ(library("gets blank DVD+R; zavsim act drive writes at 50; $probe burn /tmp/s 1 &\n"
+    EXPECT_EQ(library("gets blank DVD+R; zavsim act drive writes at 5; $probe burn /tmp/s 1 &\n"
                       "reaches 10; for tool in growisofs mkisofs; do\n"
                       "grep Name: /proc/$($probe pidof $tool)/status; done\n"
                       "$probe cancel > /dev/null")
@@ -130,7 +130,7 @@ TEST(BurningProgress, HasItsToolsInTheProcessTable) {
 }
 
 TEST(BurningProgress, StandsInTheState) {
-    EXPECT_EQ(library("gets blank DVD+R; zavsim act drive writes at 50; $probe burn /tmp/s 1 &\n"
+    EXPECT_EQ(library("gets blank DVD+R; zavsim act drive writes at 5; $probe burn /tmp/s 1 &\n"
                       "reaches 10; zavsim state | grep -E '\"(tool|kind)\": \"(gro|wr)'\n"
                       "$probe cancel > /dev/null; wait; zavsim state | grep '\"job\"'")
                   .out,
@@ -142,7 +142,7 @@ TEST(BurningProgress, StandsInTheState) {
 
 TEST(Cancelling, EndsABurnOfADvd) {
     EXPECT_EQ(
-        library("gets blank DVD+R; zavsim act drive writes at 50; $probe burn /tmp/s 1 &\n"
+        library("gets blank DVD+R; zavsim act drive writes at 5; $probe burn /tmp/s 1 &\n"
                 "reaches 30; $probe cancel > /dev/null; wait; $probe query | cut -d ' ' -f 2\n"
                 "ls /media/cdrom; $probe burn /tmp/t 1")
             .out,
@@ -150,7 +150,7 @@ TEST(Cancelling, EndsABurnOfADvd) {
 }
 
 TEST(Cancelling, EndsABurnOfACdThatCanBeErasedThen) {
-    EXPECT_EQ(library("gets blank CD-RW; zavsim act drive writes at 50; $probe burn /tmp/s 0 &\n"
+    EXPECT_EQ(library("gets blank CD-RW; zavsim act drive writes at 5; $probe burn /tmp/s 0 &\n"
                       "reaches 30; $probe cancel > /dev/null; wait; $probe query; $probe blank\n"
                       "$probe query")
                   .out,
@@ -158,7 +158,7 @@ TEST(Cancelling, EndsABurnOfACdThatCanBeErasedThen) {
 }
 
 TEST(Cancelling, LeavesTheOldFilesOfAnOverwritableDvdThatIsAddedTo) {
-    EXPECT_EQ(library("gets blank DVD+RW; $probe burn /tmp/t 1; zavsim act drive writes at 50\n"
+    EXPECT_EQ(library("gets blank DVD+RW; $probe burn /tmp/t 1; zavsim act drive writes at 5\n"
                       "rm /tmp/progress.outfile; $probe burn /tmp/s 1 & reaches 30; $probe cancel "
                       "> /dev/null; wait\n"
                       "on_disc /tmp/t")
@@ -167,7 +167,7 @@ TEST(Cancelling, LeavesTheOldFilesOfAnOverwritableDvdThatIsAddedTo) {
 }
 
 TEST(Cancelling, ByForceBreaksTheSessionAsWell) {
-    EXPECT_EQ(library("gets blank DVD+R; zavsim act drive writes at 50; $probe burn /tmp/s 1 &\n"
+    EXPECT_EQ(library("gets blank DVD+R; zavsim act drive writes at 5; $probe burn /tmp/s 1 &\n"
                       "reaches 30; kill -9 $($probe pidof growisofs); wait\n"
                       "$probe query | cut -d ' ' -f 2")
                   .out,
@@ -180,13 +180,13 @@ TEST(Cancelling, FindsNothingToEnd) {
 
 TEST(BusyDrive, KeepsItsDisc) {
     const Outcome outcome =
-        library("gets blank DVD+R; zavsim act drive writes at 50; $probe burn /tmp/s 1 &\n"
+        library("gets blank DVD+R; zavsim act drive writes at 5; $probe burn /tmp/s 1 &\n"
                 "reaches 10; zavsim act drive loses its disc; $probe cancel > /dev/null; wait\n");
     EXPECT_EQ(outcome.err, "zavsim: the drive is at work\n");
 }
 
 TEST(BusyDrive, FailsTheBurnWhenItVanishes) {
-    EXPECT_EQ(library("gets blank DVD+R; zavsim act drive writes at 50; $probe burn /tmp/s 1 &\n"
+    EXPECT_EQ(library("gets blank DVD+R; zavsim act drive writes at 5; $probe burn /tmp/s 1 &\n"
                       "reaches 10; zavsim act drive vanishes; wait; $probe query")
                   .out,
               "DVD tool failed\nerror\n");

@@ -63,14 +63,14 @@ TEST(RunWatch, PushesEachChangeAndNothingOfTheFirstRound) {
 // The driver tells of the power cut, the watch pushes what the library says of the UPS, and a third
 // process prints both. The battery lasts for 1,000 s of the appliance's clock, here 200 s.
 TEST(RunWatch, PassesAPowerCutOnToWhoeverFollowsTheEvents) {
-    const Outcome run =
-        on_zav("zavctl event follow >followed & follow=$!; " +
-               watched("--push",
-                       "zavsim act power fails; "
-                       "until [ $(grep -c 'UPS: on battery' followed) -ge 2 ]; do sleep 1; done",
-                       "UPS: online -> on battery",
-                       "kill $follow; wait $follow; echo follow ended with $?; cat followed"),
-               {"--time-scale", "5"});
+    const Outcome run = on_zav(
+        "zavctl event follow >followed & follow=$!; " +
+            watched("--push",
+                    "zavsim act power fails; "
+                    "until [ $(grep -c 'UPS: on battery' followed) -ge 2 ]; do sleep 1; done",
+                    "UPS: online -> on battery",
+                    "kill $follow; wait $follow; echo follow ended with $?; cat followed"),
+        {"--time-scale", "5"});
     EXPECT_EQ(run.status, 0);
     EXPECT_TRUE(holds(run.out, "  !  UPS: online -> on battery\n")) << run.out;
     EXPECT_TRUE(holds(run.out, "follow ended with 0\n")) << run.out;
@@ -91,7 +91,7 @@ TEST(RunWatch, GoesOnWhenNothingCanBePushed) {
 
 TEST(RunWatch, ARoundWhoseToolHangsCouldNotTellAndTheNextGoesOn) {
     const Outcome run = on_zav(
-        watched("--timeout 2",
+        watched("--timeout 10",
                 "zavsim act tool smartctl hangs 100000s; until grep -q 'disk 1: found -> unknown' "
                 "out; do sleep 1; done; zavsim act tool smartctl works again",
                 "disk 1: unknown -> found"));
