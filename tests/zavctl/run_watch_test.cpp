@@ -91,7 +91,7 @@ TEST(RunWatch, GoesOnWhenNothingCanBePushed) {
 
 TEST(RunWatch, ARoundWhoseToolHangsCouldNotTellAndTheNextGoesOn) {
     const Outcome run = on_zav(
-        watched("--timeout 10",
+        watched("--timeout 20",
                 "zavsim act tool smartctl hangs 100000s; until grep -q 'disk 1: found -> unknown' "
                 "out; do sleep 1; done; zavsim act tool smartctl works again",
                 "disk 1: unknown -> found"));
